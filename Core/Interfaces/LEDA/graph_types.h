@@ -1,0 +1,113 @@
+#ifndef LEDA_GRAPH_TYPES_H
+#define LEDA_GRAPH_TYPES_H
+
+namespace leda {
+
+class graph;
+struct node_struct;
+struct edge_struct;
+using node = node_struct*;
+using edge = edge_struct*;
+
+// One node: its place in the graph's node list, its adjacency and the 8 bytes of its record. A walk
+// over the out-edges reads
+//   for (edge e = v->first_out_edge(); e != v->stop_out_edge(); e = next) { next =
+//   e->next_out_edge(); ... }
+// and the other ones alike; all stop values are null. Only a graph makes, links and destroys nodes.
+struct node_struct {
+public:
+    edge first_out_edge() const { return m_first_out; }
+    edge stop_out_edge() const { return nullptr; }
+    edge first_out_edge_rev() const { return m_last_out; }
+    edge stop_out_edge_rev() const { return nullptr; }
+    edge first_in_edge() const { return m_first_in; }
+    edge stop_in_edge() const { return nullptr; }
+    // Number of the node in its graph; keeps its value when the node is deleted.
+    int index() const { return m_index; }
+
+private:
+    friend class graph;
+    template <class N, class E>
+    friend class GRAPH;
+    friend int compare(const node& a, const node& b);
+    node_struct() = default;
+
+    // What a search reads stands together, so that it mostly lies in one cache line.
+    edge m_first_out = nullptr;
+    int m_index = 0;
+    unsigned int m_graph = 0; // serial number of the graph
+    edge m_first_in = nullptr;
+    alignas(8) unsigned char m_record[8]{}; // GRAPH's node information
+    node m_next =
+        nullptr; // in the node list; of a deleted node, in the graph's list of deleted ones
+    node m_prev = nullptr;
+    edge m_last_out = nullptr;
+    edge m_last_in = nullptr;
+    int m_outdeg = 0;
+    int m_indeg = 0;
+};
+
+// One edge: its place in the edge list and in two adjacency lists, its ends and the 8 bytes of its
+// record.
+struct edge_struct {
+public:
+    edge next_out_edge() const { return m_next_out; }
+    edge pred_out_edge() const { return m_prev_out; }
+    edge next_in_edge() const { return m_next_in; }
+    // terminal(0) is the source, terminal(1) the target.
+    node terminal(int i) const { return m_end[i]; }
+    // Number of the edge in its graph.
+    int index() const { return m_index; }
+
+private:
+    friend class graph;
+    template <class N, class E>
+    friend class GRAPH;
+    friend int compare(const edge& a, const edge& b);
+    edge_struct() = default;
+
+    // As in a node, what a search reads comes first.
+    edge m_next_out = nullptr;
+    node m_end[2] = {};
+    edge m_next_in = nullptr;
+    alignas(8) unsigned char m_record[8]{}; // GRAPH's edge information
+    edge m_next = nullptr;                  // in the edge list
+    edge m_prev = nullptr;
+    edge m_prev_out = nullptr;
+    edge m_prev_in = nullptr;
+    int m_index = 0;
+    unsigned int m_graph = 0; // serial number of the graph
+};
+
+namespace order_detail {
+
+inline int compare_numbers(int a_index, int b_index, unsigned int a_graph, unsigned int b_graph) {
+    if (a_index != b_index)
+        return a_index < b_index ? -1 : 1;
+    return (a_graph > b_graph) - (a_graph < b_graph);
+}
+
+} // namespace order_detail
+
+// Order of node and edge handles: by index, that is by creation; handles of different graphs with
+// the same index by the creation of their graphs; null before any other. Never by address, so that
+// sets of nodes look the same in every run.
+inline int compare(const node& a, const node& b) {
+    if (a == b)
+        return 0;
+    if (!a || !b)
+        return a ? 1 : -1;
+    return order_detail::compare_numbers(a->m_index, b->m_index, a->m_graph, b->m_graph);
+}
+
+inline int compare(const edge& a, const edge& b) {
+    if (a == b)
+        return 0;
+    if (!a || !b)
+        return a ? 1 : -1;
+    return order_detail::compare_numbers(a->m_index, b->m_index, a->m_graph, b->m_graph);
+}
+
+} // namespace leda
+
+#endif

@@ -1,0 +1,3 @@
+#include "ZfCMemController.h"
+
+ZfCMemController* pZFMemory = nullptr;
