@@ -1,0 +1,23 @@
+#ifndef ZFCCFGINITASSIGNMENT_H
+#define ZFCCFGINITASSIGNMENT_H
+
+#include "ZfCCfgAssignment.h"
+
+// The assignment that the library builds by itself: initial values of the main procedure and what a
+// branch condition tells. Its right-hand side stays as it is through constant folding.
+class HPNSSA_EXPORT ZfCCfgInitAssignment : public ZfCCfgAssignment {
+public:
+    ZfCCfgInitAssignment();
+    ZfCCfgInitAssignment(const ZfCCfgInitAssignment&) = default;
+    ZfCCfgInitAssignment& operator=(const ZfCCfgInitAssignment&) = default;
+
+    // Null: it is not cloned.
+    ZfCCfgStatement* clone() override;
+    void accept(ZfCCfgVisitor* pVisitor) override;
+    void foldConstants() override;
+
+protected:
+    ~ZfCCfgInitAssignment() override;
+};
+
+#endif

@@ -1,0 +1,163 @@
+#ifndef ZFCCFGVARIABLE_H
+#define ZFCCFGVARIABLE_H
+
+#include "HpnSSAExport.h"
+#include "LEDA/graph.h"
+#include "LEDA/set.h"
+#include "LEDA/slist.h"
+#include "ZfCCfgValue.h"
+
+class ZfCCfgFactory;
+class ZfCCfgSFVariable;
+class ZfCCfgVisitor;
+class ZfCSSAVariable;
+
+// A variable of the intermediate code.
+//
+// The base knows no data type: type, scaling and limits are the client's knowledge and are asked
+// through the pure operations, which the client's variable class gives. What it keeps is what the
+// optimiser needs for each variable: a lattice value, the set of nodes that use it, the stack of
+// renaming, three markers and its virtual aliases. A virtual alias is a version that a statement
+// without code defines: for the propagation a value of its own, for liveness the same stored
+// variable as the real version that it hangs on.
+//
+// A client's variables are the client's to free; the versions (ZfCSSAVariable) belong to the
+// factory. Sets of variables walk in the order of first construction.
+class HPNSSA_EXPORT ZfCCfgVariable {
+    friend class ZfCCfgFactory;
+
+public:
+    // A copy bears the numbers of its source and is registered nowhere.
+    ZfCCfgVariable(const ZfCCfgVariable&) = default;
+    ZfCCfgVariable& operator=(const ZfCCfgVariable&) = default;
+
+    // The range of values; an original keeps none and reports 0.0 to 0.0.
+    virtual void setMinValueAndDestroyOld(ZfCCfgValue const& Value);
+    virtual void setMaxValueAndDestroyOld(ZfCCfgValue const& Value);
+    virtual ZfCCfgValue getMinValue();
+    virtual ZfCCfgValue getMaxValue();
+
+    // What the client knows: the type, the scaling (null: none), whether values beyond a limit are
+    // clipped, the limits.
+    virtual ZF_DataType* getDataType() = 0;
+    virtual ZF_Scaling* getScaling() = 0;
+    virtual bool isUpperBorderSaturated() = 0;
+    virtual bool isLowerBorderSaturated() = 0;
+    virtual double getUpperLimit() = 0;
+    virtual double getLowerLimit() = 0;
+
+    // The value before the program starts; undetermined unless the client says otherwise.
+    virtual ZfCCfgValue getInitValue();
+
+    // Whether the variable is an output of the model.
+    virtual bool isOutput();
+
+    virtual ZfCCfgSFVariable* isSFVariable();
+    virtual ZfCSSAVariable* isSSAVariable();
+
+    // Shows the variable to an SSA visitor; versions arrive at the same operation of the visitor.
+    virtual void accept(ZfCCfgVisitor* pVisitor);
+
+protected:
+    ZfCCfgVariable();
+    virtual ~ZfCCfgVariable();
+
+    // Renews a parked object: new index, undetermined, no marker, its own alias. The debug index
+    // stays.
+    virtual void initData();
+    // Empties the object for parking; debug index and value stay.
+    virtual void resetData();
+
+public:
+    // Serial numbering starts at 0 again.
+    static void boot() { s_GlobIndexCnt = 0; }
+
+    // The serial number, as dumps show it.
+    unsigned int getIndex() { return m_Index; }
+    // The number of the object's first life, by which sets are ordered.
+    int getDebugIndex() { return m_DebugIndex; }
+    // The lattice value.
+    ZfCCfgValue const& getValue() { return m_Value; }
+
+    // The stack of renaming. pop gives the popped version; top gives null when the stack is empty.
+    void pushSSAReplacement(ZfCCfgVariable* pVariable) { m_SSAReplacements.push(pVariable); }
+    ZfCCfgVariable* popSSAReplacement() { return m_SSAReplacements.pop(); }
+    ZfCCfgVariable* topSSAReplacement() {
+        return m_SSAReplacements.empty() ? nullptr : m_SSAReplacements.top();
+    }
+
+    // The nodes that use this variable; valid until the graph is edited.
+    void appendUse(leda::node v) { m_Uses.insert(v); }
+    // Takes a use out and gives the number of those left. A node that is not there is reported as
+    // an assertion.
+    int delUse(leda::node v);
+    leda::set<leda::node, leda::avl_tree> getUses() { return m_Uses; }
+    // The uses of this variable and of its virtual aliases.
+    leda::set<leda::node, leda::avl_tree> getAllUses();
+    void clearUses() { m_Uses.clear(); }
+    int countUses() { return m_Uses.size(); }
+    // A plain sum over this variable and its aliases: a node that uses two of them counts twice.
+    int countAllUses();
+
+    // Markers. An array or a volatile variable is non-constant from the marking on. Only parking
+    // takes a marker back.
+    bool isArray() { return m_IsArray; }
+    void markAsArray();
+    bool isVolatile() { return m_IsVolatile; }
+    void markAsVolatile();
+    // Whether a definition of this variable may be removed.
+    bool isErasable() { return m_IsErasable; }
+    void markAsErasable() { m_IsErasable = true; }
+
+    // Whether the scaling differs from least significant bit 1.0 and offset 0.0.
+    bool isScaled();
+
+    // The real variable behind a virtual alias, for any other variable itself; null only while
+    // parked.
+    ZfCCfgVariable* getNonVirtualAlias() { return m_pNonVirtualAlias; }
+    void setNonVirtualAlias(ZfCCfgVariable* pVariable) { m_pNonVirtualAlias = pVariable; }
+    void appendVirtualAlias(ZfCCfgVariable* pVariable) { m_VirtualAliases.insert(pVariable); }
+
+    // Clips the number at the saturated limits; true if it was clipped. The kind is not looked at.
+    bool ConsiderSaturation(ZfCCfgValue& Value);
+
+    // Stores Value as this variable would hold it, and changes the argument alike: clipped, or else
+    // scaled or wrapped. A value of an array or volatile variable becomes non-constant.
+    void setVarValueAndAdjustCfgValue(ZfCCfgValue& Value);
+
+protected:
+    // Turns a constant number into what this variable holds of it: the limit if it is clipped,
+    // which is then final even off the grid, else the scaled or wrapped number.
+    void adjustConstant(ZfCCfgValue& Value);
+
+private:
+    unsigned int m_Index;
+    int m_DebugIndex;                               // written by the constructor alone
+    leda::stack<ZfCCfgVariable*> m_SSAReplacements; // balanced by renaming; else empty
+    ZfCCfgValue m_Value;
+    leda::set<leda::node, leda::avl_tree> m_Uses; // stale after any graph edit
+    bool m_IsArray;
+    bool m_IsErasable;
+    bool m_IsVolatile;
+    ZfCCfgVariable* m_pNonVirtualAlias; // this, unless a virtual alias
+    leda::set<ZfCCfgVariable*, leda::avl_tree> m_VirtualAliases;
+
+    static unsigned int s_GlobIndexCnt;
+};
+
+namespace leda {
+
+// Order of sets of variables: null first, then by debug index.
+inline int compare(ZfCCfgVariable* const& pLeft, ZfCCfgVariable* const& pRight) {
+    if (pLeft == pRight)
+        return 0;
+    if (pLeft == nullptr || pRight == nullptr)
+        return pLeft == nullptr ? -1 : 1;
+    const int Left = pLeft->getDebugIndex();
+    const int Right = pRight->getDebugIndex();
+    return (Left > Right) - (Left < Right);
+}
+
+} // namespace leda
+
+#endif

@@ -1,0 +1,3 @@
+#include "ZfCCfgVisitor.h"
+
+ZfCCfgVisitor::~ZfCCfgVisitor() = default;

@@ -1,0 +1,58 @@
+#ifndef ZFCSSAVARIABLE_H
+#define ZFCSSAVARIABLE_H
+
+#include "ZfCCfgVariable.h"
+
+// One SSA version of a variable, made for one definition by renaming.
+//
+// A version points at its original variable, which is never itself a version, and forwards the
+// questions of type, scaling and limits to it. It has what an original lacks: a range of values.
+// Versions are made, parked and freed by the factory (ZfCCfgFactory::createSSAVariable).
+class HPNSSA_EXPORT ZfCSSAVariable : public ZfCCfgVariable {
+    friend class ZfCCfgFactory;
+
+public:
+    ZfCSSAVariable(const ZfCSSAVariable&) = default;
+    ZfCSSAVariable& operator=(const ZfCSSAVariable&) = default;
+
+    // Store an end of the range as the variable would hold it: a constant is clipped, or else
+    // scaled or wrapped; for an array or volatile variable the end becomes non-constant.
+    void setMinValueAndDestroyOld(ZfCCfgValue const& Value) override;
+    void setMaxValueAndDestroyOld(ZfCCfgValue const& Value) override;
+    ZfCCfgValue getMinValue() override;
+    ZfCCfgValue getMaxValue() override;
+
+    // Forwarded to the original.
+    ZF_DataType* getDataType() override;
+    ZF_Scaling* getScaling() override;
+    bool isUpperBorderSaturated() override;
+    bool isLowerBorderSaturated() override;
+    double getUpperLimit() override;
+    double getLowerLimit() override;
+    ZfCCfgValue getInitValue() override;
+
+    ZfCSSAVariable* isSSAVariable() override;
+
+    // The variable that this is a version of; null while parked.
+    ZfCCfgVariable* getOrigVar() { return m_pOrigVar; }
+    // Takes the original behind pVar when that is a version itself, so that there are no chains.
+    void setOrigVar(ZfCCfgVariable* pVar);
+
+protected:
+    explicit ZfCSSAVariable(ZfCCfgVariable* pVar);
+    ~ZfCSSAVariable() override;
+
+    using ZfCCfgVariable::initData;
+    // Renews a parked version for pVar, whose markers it takes.
+    void initData(ZfCCfgVariable* pVar);
+    void resetData() override;
+
+private:
+    void bindTo(ZfCCfgVariable* pVar);
+
+    ZfCCfgVariable* m_pOrigVar; // not owned
+    ZfCCfgValue m_MinValue;
+    ZfCCfgValue m_MaxValue;
+};
+
+#endif
