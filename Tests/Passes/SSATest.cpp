@@ -19,7 +19,8 @@ std::string names(VariableSet const& Variables) {
 // --- Summaries and boundary statements ---
 
 TEST(Summaries, CalleesSetsReachEveryCallerThroughRings) {
-    Program P("proc main { a = b; call p; } proc p { c = 1; call q; } proc q { d = c; if d { call p; } call leaf; }"
+    Program P("proc main { a = b; call p; } proc p { c = 1; call q; } proc q { d = c; if d { call "
+              "p; } call leaf; }"
               "proc leaf { e = 2; call leaf; } proc alone { f = 3; call leaf; }");
     ZfCCfgAssignment* pAlone = nullptr;
     for (auto& Item : P.statements())
@@ -27,8 +28,15 @@ TEST(Summaries, CalleesSetsReachEveryCallerThroughRings) {
             pAlone = Item.second->isAssignment();
     pAlone->setIsValidConditionAssignment(true); // counts neither as definition nor as use
     P.toSSA();
-    struct { char const* Name; char const* Defined; char const* Used; } Rows[] = {
-        {"#main", "a c d e", "b c d"}, {"p", "c d e", "c d"}, {"q", "c d e", "c d"}, {"leaf", "e", ""}, {"alone", "e", ""}};
+    struct {
+        char const* Name;
+        char const* Defined;
+        char const* Used;
+    } Rows[] = {{"#main", "a c d e", "b c d"},
+                {"p", "c d e", "c d"},
+                {"q", "c d e", "c d"},
+                {"leaf", "e", ""},
+                {"alone", "e", ""}};
     for (auto& Row : Rows) {
         EXPECT_EQ(names(P.procedure(Row.Name)->getDefinedVariables()), Row.Defined) << Row.Name;
         EXPECT_EQ(names(P.procedure(Row.Name)->getUsedVariables()), Row.Used) << Row.Name;
@@ -43,7 +51,8 @@ TEST(Summaries, RandomCallGraphsAgreeWithTheClosure) {
         std::string Text;
         std::vector<std::set<int>> Reached(static_cast<std::size_t>(Count));
         for (int i = 0; i < Count; ++i) {
-            Text += "proc " + (i == 0 ? std::string("main") : "p" + std::to_string(i)) + " { v" + std::to_string(i) + " = 1; ";
+            Text += "proc " + (i == 0 ? std::string("main") : "p" + std::to_string(i)) + " { v" +
+                    std::to_string(i) + " = 1; ";
             for (int k = int(Random() % 3); k > 0; --k) {
                 int j = 1 + int(Random() % unsigned(Count - 1));
                 Reached[std::size_t(i)].insert(j);
@@ -62,25 +71,29 @@ TEST(Summaries, RandomCallGraphsAgreeWithTheClosure) {
             std::set<std::string> Expected, Found;
             for (int j : Reached[std::size_t(i)])
                 Expected.insert("v" + std::to_string(j));
-            for (ZfCCfgVariable* pVar : P.procedure(i == 0 ? "#main" : "p" + std::to_string(i))->getDefinedVariables())
+            for (ZfCCfgVariable* pVar :
+                 P.procedure(i == 0 ? "#main" : "p" + std::to_string(i))->getDefinedVariables())
                 Found.insert(static_cast<Variable*>(pVar)->Name);
             EXPECT_EQ(Found, Expected) << Text;
         }
     }
 }
 
-// The statements of a node's block, by kind and variable: "init a", "param b 2" (arguments), "return c", "output d".
+// The statements of a node's block, by kind and variable: "init a", "param b 2" (arguments),
+// "return c", "output d".
 std::string contents(Program& P, leda::node v) {
     std::string Text;
     for (ZfCCfgStatement* pStmt : P.blockOf(v)->getStatementSeq()) {
         if (ZfCCfgParamStatement* pParam = pStmt->isParamStatement())
-            Text += "param " + names(pStmt->getDefinedVariables()) + " " + std::to_string(pParam->countParamExpressions());
+            Text += "param " + names(pStmt->getDefinedVariables()) + " " +
+                    std::to_string(pParam->countParamExpressions());
         else if (pStmt->isValueReturnStatement())
             Text += "return " + names(pStmt->getDefinedVariables());
         else if (pStmt->isOutputStatement())
             Text += "output " + names(pStmt->getUsedVariables());
         else if (pStmt->isAssignment())
-            Text += (dynamic_cast<ZfCCfgInitAssignment*>(pStmt) ? "init " : "set ") + names(pStmt->getDefinedVariables());
+            Text += (dynamic_cast<ZfCCfgInitAssignment*>(pStmt) ? "init " : "set ") +
+                    names(pStmt->getDefinedVariables());
         else
             Text += "call";
         Text += "; ";
@@ -145,13 +158,16 @@ std::set<leda::node> reachable(ZfCControlFlowGraph& G, leda::node Without) {
     return Seen;
 }
 
-// Blocks below each other with random extra edges: back edges, self-loops and parallel edges included.
+// Blocks below each other with random extra edges: back edges, self-loops and parallel edges
+// included.
 void makeRandomGraph(Program& P, std::mt19937& Random) {
     for (char const* Name : {"#main", "p"}) {
         leda::node Entry = P.entry(Name);
         std::vector<leda::node> Nodes;
         for (int Count = 1 + int(Random() % 12), i = 0; i < Count; ++i) {
-            std::string Text = Random() % 2 ? "v" + std::to_string(Random() % 4) + " = v" + std::to_string(Random() % 4) + ";" : "";
+            std::string Text = Random() % 2 ? "v" + std::to_string(Random() % 4) + " = v" +
+                                                  std::to_string(Random() % 4) + ";"
+                                            : "";
             leda::node v = P.block(Text);
             P.edge(i == 0 ? Entry : Nodes[Random() % Nodes.size()], v);
             Nodes.push_back(v);
@@ -162,10 +178,15 @@ void makeRandomGraph(Program& P, std::mt19937& Random) {
     // A way out for each procedure: an exit node without in-edges would be a component of its own.
     for (leda::node v : leda::list<leda::node>(P.graph().all_nodes()))
         if (P.blockOf(v) && Random() % 4 == 0)
-            P.edge(v, [&] { leda::node w = P.block(); P.blockOf(w)->setProcedure(P.blockOf(v)->getProcedure()); return w; }());
+            P.edge(v, [&] {
+                leda::node w = P.block();
+                P.blockOf(w)->setProcedure(P.blockOf(v)->getProcedure());
+                return w;
+            }());
     for (char const* Name : {"#main", "p"}) {
         P.entry(Name);
-        P.edge(P.graph().target(P.graph().first_adj_edge(P.procedure(Name)->getEntryNode())), P.block());
+        P.edge(P.graph().target(P.graph().first_adj_edge(P.procedure(Name)->getEntryNode())),
+               P.block());
     }
 }
 
@@ -197,6 +218,28 @@ TEST(Dominators, TakingTheDominatorAwayMakesTheNodeUnreachable) {
     }
 }
 
+// Large enough for deep spanning trees and unbalanced forests.
+TEST(Dominators, LargeGraphsAgreeWithTheIterativeAlgorithm) {
+    std::mt19937 Random(3);
+    for (unsigned int Spread : {2u, 10u, 3000u}) {
+        Program P;
+        std::vector<leda::node> Nodes{P.entry("#main"), P.block()};
+        P.edge(Nodes[0], Nodes[1]);
+        for (std::size_t i = 2; i < 3000; ++i) {
+            Nodes.push_back(P.block());
+            P.edge(Nodes[i - 1 - Random() % std::min<std::size_t>(Spread, i - 1)], Nodes[i]);
+        }
+        for (int Extra = 0; Extra < 1500; ++Extra) {
+            std::size_t From = 1 + Random() % 2999, Step = Random() % 40;
+            P.edge(Nodes[From], Nodes[1 + (From + Step) % 2999]);
+        }
+        P.graph().computeAllIdoms();
+        SSAVerifier Iterative(P.graph());
+        for (leda::node v : Nodes)
+            ASSERT_EQ(P.graph().inf(v)->getIdom(), Iterative.idom(v)) << Spread;
+    }
+}
+
 TEST(PhiPlacement, FrontiersAgreeWithTheirDefinitionAndTheFormIsMinimalSSA) {
     std::mt19937 Random(2);
     for (int Run = 0; Run < 150; ++Run) {
@@ -208,7 +251,8 @@ TEST(PhiPlacement, FrontiersAgreeWithTheirDefinitionAndTheFormIsMinimalSSA) {
         EXPECT_EQ(Verifier.violations(), "") << "run " << Run;
         for (leda::node x : G.all_nodes()) {
             // Where an exit moved down, the block in its place is younger than the frontiers.
-            if (x->first_out_edge() && G.inf(G.target(x->first_out_edge()))->isExitNode() && G.indeg(x) > 1)
+            if (x->first_out_edge() && G.inf(G.target(x->first_out_edge()))->isExitNode() &&
+                G.indeg(x) > 1)
                 continue;
             std::set<leda::node> Expected, Found;
             for (leda::node y : G.all_nodes())
@@ -236,7 +280,8 @@ TEST(PhiPlacement, FrontiersAgreeWithTheirDefinitionAndTheFormIsMinimalSSA) {
 
 TEST(PhiPlacement, AnExitThatNeedsPhiFunctionsMovesDownOnce) {
     Program P;
-    leda::node Entry = P.entry("#main"), c = P.block("? x"), a = P.block("y=1; z=1;"), b = P.block();
+    leda::node Entry = P.entry("#main"), c = P.block("? x"), a = P.block("y=1; z=1;"),
+               b = P.block();
     P.edge(Entry, c);
     P.trueEdge(c, a);
     P.falseEdge(c, b);
@@ -275,7 +320,8 @@ TEST(Renaming, LoopHeadTakesInitialValueAndValueOfTheBackEdge) {
                 pPhi = Item.second->isPhiFunction() ? Item.second->isPhiFunction() : pPhi;
                 Versions.push_back(pVar);
             }
-    // Node order: i = 0; the phi function; the two in the body; the initial value, in the youngest block.
+    // Node order: i = 0; the phi function; the two in the body; the initial value, in the youngest
+    // block.
     ASSERT_EQ(Versions.size(), 5u);
     ASSERT_NE(pPhi, nullptr);
     EXPECT_EQ(pPhi->getReplacementVariables()[0], Versions[0]);
@@ -291,14 +337,18 @@ TEST(Renaming, BothEdgesOfABranchToOneNodeTakeTheSameVersion) {
     P.trueEdge(w, w); // a block that fills the phi function that it renamed itself
     P.falseEdge(w, P.block());
     P.edge(h, w);
-    P.blockOf(w)->append(new ZfCCfgExternCall([] { static leda::list<ZfCCfgVariable*> None; return &None; }()));
+    P.blockOf(w)->append(new ZfCCfgExternCall([] {
+        static leda::list<ZfCCfgVariable*> None;
+        return &None;
+    }()));
     auto* pSet = new ZfCCfgInitAssignment();
     pSet->setLHS(P.var("x"));
     pSet->setRHS(P.expression("x + 1"));
     P.blockOf(w)->append(pSet);
     P.toSSA();
     EXPECT_EQ(verifySSA(P.graph()), "");
-    leda::array<ZfCCfgVariable*> Operands = P.blockOf(w)->getPhiFunctions().front()->getReplacementVariables();
+    leda::array<ZfCCfgVariable*> Operands =
+        P.blockOf(w)->getPhiFunctions().front()->getReplacementVariables();
     ASSERT_EQ(Operands.size(), 4);
     EXPECT_EQ(Operands[0], Operands[1]);
     EXPECT_EQ(Operands[2], pSet->getLHS());
@@ -327,7 +377,8 @@ TEST(Renaming, AVirtualAssignmentHangsOnTheRealVersion) {
 TEST(Renaming, AUseWithoutAVersionReachesTheUser) {
     for (bool IsVirtual : {false, true}) {
         Program P("proc main { a = 1; }");
-        // Hidden from the summaries, so that neither u nor the variable behind the alias has a value at the entry.
+        // Hidden from the summaries, so that neither u nor the variable behind the alias has a
+        // value at the entry.
         auto* pHidden = P.statements()[0].second->isAssignment();
         pHidden->setRHS(P.expression(IsVirtual ? "1" : "u"));
         pHidden->setIsValidConditionAssignment(true);

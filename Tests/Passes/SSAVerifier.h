@@ -1,19 +1,24 @@
 #ifndef PASSES_SSAVERIFIER_H
 #define PASSES_SSAVERIFIER_H
 
-// Verifies that a graph is in SSA form, at any time between transformToSSAForm and the end of the run, with several items
-// in a node or one. It knows nothing of the client's classes. The invariants:
+// Verifies that a graph is in SSA form, at any time between transformToSSAForm and the end of the
+// run, with several items in a node or one. It knows nothing of the client's classes. The
+// invariants:
 //
-// 1. What a phi function, assignment, parameter or value return statement defines is an SSA version, and no version is
+// 1. What a phi function, assignment, parameter or value return statement defines is an SSA
+// version, and no version is
 //    defined twice.
-// 2. What is used is a version, and its definition dominates the use. An argument is used at its call; the expression of
+// 2. What is used is a version, and its definition dominates the use. An argument is used at its
+// call; the expression of
 //    a value return statement is used at the callee's exit, if control gets there.
-// 3. A phi function has an operand for each control flow in-edge of its join, and the definition of operand i dominates
-//    the source of in-edge i. In a divided graph, the join is the node at the head of the chain of phi functions.
+// 3. A phi function has an operand for each control flow in-edge of its join, and the definition of
+// operand i dominates
+//    the source of in-edge i. In a divided graph, the join is the node at the head of the chain of
+//    phi functions.
 // 4. The renaming stacks of all variables are empty.
 //
-// Linear in program and phi operands, but for the dominators (iterative, by K. D. Cooper, T. J. Harvey and K. Kennedy),
-// which are computed here, from control flow alone.
+// Linear in program and phi operands, but for the dominators (iterative, by K. D. Cooper, T. J.
+// Harvey and K. Kennedy), which are computed here, from control flow alone.
 
 #include <algorithm>
 #include <climits>
@@ -37,6 +42,8 @@ public:
     // What is wrong, a line each; empty if nothing is.
     std::string const& violations() const { return m_Violations; }
 
+    // Null for an entry node and for what is not reached.
+    leda::node idom(leda::node v) { return m_Idom[index(v)]; }
     bool dominates(leda::node u, leda::node v) {
         while (v != nullptr && m_Number[index(v)] > m_Number[index(u)])
             v = m_Idom[index(v)];
@@ -61,7 +68,8 @@ private:
         return Edges;
     }
 
-    // Reverse postorder from all entry nodes; m_Number is the place in it, -1 for what is not reached.
+    // Reverse postorder from all entry nodes; m_Number is the place in it, -1 for what is not
+    // reached.
     void computeDominators() {
         m_Number.assign(std::size_t(m_Graph.max_node_index() + 1), -1);
         m_Idom.assign(m_Number.size(), nullptr);
@@ -143,8 +151,9 @@ private:
     bool isDefinedBefore(ZfCCfgVariable* pVar, Place Use, char const* pWhat) {
         auto Found = m_Definitions.find(pVar);
         if (Found == m_Definitions.end()) {
-            report(std::string(pWhat) + (pVar != nullptr && pVar->isSSAVariable() != nullptr ? " has no definition"
-                                                                                           : " is no version"),
+            report(std::string(pWhat) + (pVar != nullptr && pVar->isSSAVariable() != nullptr
+                                             ? " has no definition"
+                                             : " is no version"),
                    Use.v);
             return false;
         }
@@ -155,7 +164,8 @@ private:
             report(std::string(pWhat) + " is not dominated by its definition", Use.v);
         return Before;
     }
-    void checkUses(leda::set<ZfCCfgVariable*, leda::avl_tree> const& Uses, Place At, char const* pWhat) {
+    void checkUses(leda::set<ZfCCfgVariable*, leda::avl_tree> const& Uses, Place At,
+                   char const* pWhat) {
         for (ZfCCfgVariable* pVar : Uses)
             isDefinedBefore(pVar, At, pWhat);
     }
@@ -172,12 +182,14 @@ private:
             ++Position;
         }
         if (pBlock->getBranchCond() != nullptr)
-            checkUses(pBlock->getBranchCond()->getUsedVariables(), {v, INT_MAX}, "a condition's variable");
+            checkUses(pBlock->getBranchCond()->getUsedVariables(), {v, INT_MAX},
+                      "a condition's variable");
     }
     void checkStatement(ZfCCfgStatement* pStmt, Place At) {
         if (ZfCCfgParamStatement* pParam = pStmt->isParamStatement()) {
             auto& Arguments = pParam->getParamExpressions();
-            for (auto Item = Arguments.first_item(); Item != nullptr; Item = Arguments.next_item(Item)) {
+            for (auto Item = Arguments.first_item(); Item != nullptr;
+                 Item = Arguments.next_item(Item)) {
                 auto Call = m_Calls.find(Arguments.key(Item));
                 if (Call != m_Calls.end() && isReached(Call->second.v))
                     checkUses(Arguments.inf(Item)->getUsedVariables(), Call->second, "an argument");
@@ -221,7 +233,8 @@ private:
             ZfCCfgVariable* pOperand = Operands[int(i)];
             if (pOperand == nullptr || pOperand->isSSAVariable() == nullptr)
                 report("an operand is no version", v);
-            else if (pOperand->isSSAVariable()->getOrigVar() != pPhi->getVariable()->isSSAVariable()->getOrigVar())
+            else if (pOperand->isSSAVariable()->getOrigVar() !=
+                     pPhi->getVariable()->isSSAVariable()->getOrigVar())
                 report("an operand is of another variable", v);
             else if (isReached(u))
                 isDefinedBefore(pOperand, {u, INT_MAX}, "an operand");
@@ -241,7 +254,9 @@ private:
     std::string m_Violations;
 };
 
-inline std::string verifySSA(ZfCControlFlowGraph& Graph) { return SSAVerifier(Graph).violations(); }
+inline std::string verifySSA(ZfCControlFlowGraph& Graph) {
+    return SSAVerifier(Graph).violations();
+}
 
 } // namespace passes
 

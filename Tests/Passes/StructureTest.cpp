@@ -5,14 +5,17 @@
 namespace passes {
 namespace {
 
-// What a node leads to by each of its edges: 't' true, 'f' false, '-' plain, with the order number of the target among
-// Nodes ('?' for any other).
+// What a node leads to by each of its edges: 't' true, 'f' false, '-' plain, with the order number
+// of the target among Nodes ('?' for any other).
 std::string outEdges(Program& P, leda::node v, std::vector<leda::node> const& Nodes) {
     std::string Text;
     for (leda::edge e : P.graph().out_edges(v)) {
         auto Found = std::find(Nodes.begin(), Nodes.end(), P.graph().target(e));
         ZfCCfgEdgeInfo* pInf = P.graph().inf(e);
-        Text += pInf->isTrueBranch() ? "t" : pInf->isFalseBranch() ? "f" : pInf->isSSAEdge() ? "s" : "-";
+        Text += pInf->isTrueBranch()    ? "t"
+                : pInf->isFalseBranch() ? "f"
+                : pInf->isSSAEdge()     ? "s"
+                                        : "-";
         Text += Found == Nodes.end() ? "?" : std::to_string(Found - Nodes.begin());
     }
     return Text;
@@ -20,7 +23,8 @@ std::string outEdges(Program& P, leda::node v, std::vector<leda::node> const& No
 
 TEST(StructureEdits, SplitMovesContentsAndOutEdgesToTheSecondHalf) {
     Program P;
-    leda::node Entry = P.entry("#main"), v = P.block("a=1; b=2; ? a<b"), T = P.block(), F = P.block();
+    leda::node Entry = P.entry("#main"), v = P.block("a=1; b=2; ? a<b"), T = P.block(),
+               F = P.block();
     P.edge(Entry, v);
     P.trueEdge(v, T);
     P.falseEdge(v, F);
@@ -30,7 +34,9 @@ TEST(StructureEdits, SplitMovesContentsAndOutEdgesToTheSecondHalf) {
     leda::node w = P.graph().splitAtStatement(v, pSecond);
     leda::node c = P.graph().splitAtCondition(w);
     EXPECT_EQ(P.graph().splitAtCondition(c), c);
-    EXPECT_EQ(outEdges(P, v, {T, F, w, c}) + outEdges(P, w, {T, F, w, c}) + outEdges(P, c, {T, F, w, c}), "-2-3t0f1");
+    EXPECT_EQ(outEdges(P, v, {T, F, w, c}) + outEdges(P, w, {T, F, w, c}) +
+                  outEdges(P, c, {T, F, w, c}),
+              "-2-3t0f1");
     EXPECT_EQ(P.blockOf(v)->isStatement(), pFirst);
     EXPECT_EQ(P.blockOf(w)->isStatement(), pSecond);
     EXPECT_NE(P.blockOf(c)->getBranchCond(), nullptr);
@@ -43,13 +49,15 @@ TEST(StructureEdits, SplitOfANodeWithoutABlockIsAnInternalError) {
     Reports R(false);
     P.graph().splitAtCondition(Entry);
     ASSERT_EQ(R.Messages.size(), 1u);
-    EXPECT_EQ(R.Messages[0].rfind("10007: Internal error. Error code: ZfCControlFlowGraph ", 0), 0u);
+    EXPECT_EQ(R.Messages[0].rfind("10007: Internal error. Error code: ZfCControlFlowGraph ", 0),
+              0u);
     EXPECT_TRUE(Reports::assertions().empty());
 }
 
 TEST(StructureEdits, DivideLeavesOneItemForEachNodeAndKeepsEdges) {
     Program P;
-    leda::node Entry = P.entry("#main"), v = P.block("a=1; b=2; ? a<b"), Empty = P.block(), J = P.block();
+    leda::node Entry = P.entry("#main"), v = P.block("a=1; b=2; ? a<b"), Empty = P.block(),
+               J = P.block();
     P.edge(Entry, v);
     P.trueEdge(v, v); // a block that branches to itself
     P.falseEdge(v, Empty);
@@ -60,7 +68,8 @@ TEST(StructureEdits, DivideLeavesOneItemForEachNodeAndKeepsEdges) {
         leda::node a = P.graph().target(P.graph().first_adj_edge(Entry));
         leda::node b = P.graph().target(P.graph().first_adj_edge(a));
         leda::node c = P.graph().target(P.graph().first_adj_edge(b));
-        EXPECT_EQ(outEdges(P, a, {a, b, c, Empty}) + outEdges(P, b, {a, b, c, Empty}) + outEdges(P, c, {a, b, c, Empty}),
+        EXPECT_EQ(outEdges(P, a, {a, b, c, Empty}) + outEdges(P, b, {a, b, c, Empty}) +
+                      outEdges(P, c, {a, b, c, Empty}),
                   "-1-2t0f3");
         EXPECT_EQ(P.graph().source(P.graph().first_in_edge(a)), Entry); // in-edges in their order
         EXPECT_EQ(P.graph().indeg(a), 2);
@@ -80,7 +89,8 @@ TEST(StructureEdits, FindBranchNodeGoesOnInTheProcedureCalledAtTheEnd) {
     Reports R(true);
     EXPECT_EQ(P.graph().findBranchNode(v, P.blockOf(Branch)->getBranchCond()), Branch);
     EXPECT_TRUE(R.silent());
-    EXPECT_EQ(P.graph().findBranchNode(v, P.expression("b")), Branch); // another condition: reported, then answered
+    EXPECT_EQ(P.graph().findBranchNode(v, P.expression("b")),
+              Branch); // another condition: reported, then answered
     EXPECT_EQ(R.Messages.size(), 1u);
     EXPECT_EQ(Reports::assertions(), std::vector<std::string>{"0"});
 }
@@ -107,7 +117,8 @@ TEST(Frames, EveryOpenEndLeadsToTheOneExitOfItsProcedure) {
         EXPECT_EQ(P.graph().inf(pProcedure->getExitNode())->getProcedure(), pProcedure);
         EXPECT_EQ(P.graph().indeg(pProcedure->getExitNode()), InEdges[i]) << Names[i];
     }
-    EXPECT_FALSE(P.graph().checkConsistency()); // the exit of the endless loop is a component of its own
+    EXPECT_FALSE(
+        P.graph().checkConsistency()); // the exit of the endless loop is a component of its own
 }
 
 TEST(Frames, LoopAroundMainHasAnUnknownConditionAndBothWays) {
@@ -131,12 +142,14 @@ TEST(Frames, ConsistencyAssertsEachRuleOfAComponent) {
     EXPECT_TRUE(P.graph().checkConsistency());
     P.blockOf(Stray)->setProcedure(nullptr);
     EXPECT_TRUE(P.graph().checkConsistency());
-    EXPECT_EQ(Reports::assertions(), (std::vector<std::string>{"v == EntryNode", "pInf->getProcedure() == pProcedure",
-                                                               "v == EntryNode"}));
+    EXPECT_EQ(Reports::assertions(),
+              (std::vector<std::string>{"v == EntryNode", "pInf->getProcedure() == pProcedure",
+                                        "v == EntryNode"}));
     EXPECT_TRUE(R.Messages.empty());
 }
 
-// Entry -> c -(t)-> a -> Shared -> Behind, c -(f)-> Shared: one plain edge and one branch edge come to Shared.
+// Entry -> c -(t)-> a -> Shared -> Behind, c -(f)-> Shared: one plain edge and one branch edge come
+// to Shared.
 struct SharedCode {
     Program P;
     leda::node c, a, Shared, Behind;
@@ -188,7 +201,8 @@ TEST(Extraction, AJoinInsideEnteredFromOutsideIsExtractedToo) {
 }
 
 TEST(Extraction, EveryJoinOfAChainBecomesAProcedure) {
-    // a1 -> a2 -> ... in the extracted part, each entered from a branch of the old procedure as well.
+    // a1 -> a2 -> ... in the extracted part, each entered from a branch of the old procedure as
+    // well.
     Program P;
     leda::node Entry = P.entry("#main"), Outside = P.block("? x"), v = P.block("y=0;");
     P.edge(Entry, Outside);
@@ -205,7 +219,8 @@ TEST(Extraction, EveryJoinOfAChainBecomesAProcedure) {
     P.trueEdge(Outside, P.block());
     P.graph().makeProcedureAndCall(v);
     EXPECT_TRUE(P.graph().checkConsistency()); // as many components as procedures
-    EXPECT_EQ(P.calls().size(), 121u);         // one from outside for each, one along each link of the chain
+    EXPECT_EQ(P.calls().size(),
+              121u); // one from outside for each, one along each link of the chain
 }
 
 TEST(Extraction, BehindAnEntryNodeTheProcedureIsThatOfTheEntry) {

@@ -112,9 +112,9 @@ private:
     void lookAgainAt(ZfCCfgVariable* pVariable, leda::node Current);
 
     CfgGraph& m_Graph;
-    leda::map<ZfCCfgVariable*, leda::node> m_DefiningNode;  // candidates that still had uses
-    leda::set<leda::node, leda::avl_tree> m_ThisSweep;      // behind the current node
-    leda::set<leda::node, leda::avl_tree> m_NextSweep;      // at or before it
+    leda::map<int, leda::node> m_DefiningNode; // by debug index: candidates that still had uses
+    leda::set<leda::node, leda::avl_tree> m_ThisSweep; // behind the current node
+    leda::set<leda::node, leda::avl_tree> m_NextSweep; // at or before it
 };
 
 void UnusedDefinitionSweeper::examine(leda::node v) {
@@ -160,7 +160,7 @@ bool UnusedDefinitionSweeper::isUnused(ZfCCfgVariable* pVariable, ZfCCfgStatemen
 
 void UnusedDefinitionSweeper::remember(ZfCCfgVariable* pVariable, leda::node v) {
     if (pVariable->isErasable() && !pVariable->isArray()) {
-        m_DefiningNode[pVariable] = v;
+        m_DefiningNode[pVariable->getDebugIndex()] = v;
     }
 }
 
@@ -169,7 +169,7 @@ void UnusedDefinitionSweeper::remember(ZfCCfgVariable* pVariable, leda::node v) 
 // sweep will come to it.
 void UnusedDefinitionSweeper::lookAgainAt(ZfCCfgVariable* pVariable, leda::node Current) {
     for (ZfCCfgVariable* pCandidate : {pVariable, pVariable->getNonVirtualAlias()}) {
-        leda::node const* pNode = m_DefiningNode.lookup(pCandidate);
+        leda::node const* pNode = m_DefiningNode.lookup(pCandidate->getDebugIndex());
         if (pNode == nullptr) {
             continue;
         }

@@ -22,6 +22,8 @@
 
 #include "ZfCInternalCheck.h"
 
+#include <utility>
+
 namespace {
 
 using NodeSet = leda::set<leda::node, leda::avl_tree>;
@@ -48,13 +50,14 @@ void ZfCControlFlowGraph::computeAllIdoms() {
     }
     // Step 2: one map for all components.
     NodeMap Idom;
-    // Step 3: component by component.
+    // Step 3: component by component. The sets are given away, and the results are stored when all
+    // are there: a component does not look at another's.
     for (int i = 0; i < Count; ++i) {
-        computeIdomsFast(ComponentNodes[i], Idom);
-        for (leda::node v : ComponentNodes[i]) {
-            leda::node const* pIdom = Idom.lookup(v);
-            inf(v)->setIdom(pIdom != nullptr ? *pIdom : nullptr);
-        }
+        computeIdomsFast(std::move(ComponentNodes[i]), Idom);
+    }
+    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
+        leda::node const* pIdom = Idom.lookup(v);
+        inf(v)->setIdom(pIdom != nullptr ? *pIdom : nullptr);
     }
 }
 

@@ -163,7 +163,8 @@ leda::node ZfCControlFlowGraph::findBranchNode(leda::node v, ZfCCfgExpression* p
             reportInternalError("ZfCControlFlowGraph", __LINE__);
             return nullptr;
         }
-        leda::node EntryNode = m_Procedures.inf(m_Procedures.lookup(pCall->getName()))->getEntryNode();
+        leda::node EntryNode =
+            m_Procedures.inf(m_Procedures.lookup(pCall->getName()))->getEntryNode();
         x = target(first_adj_edge(EntryNode));
     }
 }

@@ -68,8 +68,7 @@ void replaceInEdgesByCalls(ZfCControlFlowGraph& Graph, leda::node v, ZfCCfgProce
 }
 
 // Step 5: everything that is reached from v belongs to the new procedure.
-void stampReachedNodes(ZfCControlFlowGraph& Graph, leda::node v,
-                       ZfCCfgProcedure* pOldProcedure,
+void stampReachedNodes(ZfCControlFlowGraph& Graph, leda::node v, ZfCCfgProcedure* pOldProcedure,
                        ZfCCfgProcedure* pNewProcedure) {
     leda::node_array<bool> Reached(Graph, false);
     for (leda::node w : leda::DFS(Graph, v, Reached)) {

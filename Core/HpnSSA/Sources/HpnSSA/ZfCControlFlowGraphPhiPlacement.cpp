@@ -96,8 +96,7 @@ void placeAt(ZfCControlFlowGraph& Graph, leda::node y, ZfCCfgVariable* pVariable
 
 } // namespace
 
-void ZfCControlFlowGraph::computeDominanceFrontiers(
-    leda::array<ZfCDominatorTree*>& DominatorTree) {
+void ZfCControlFlowGraph::computeDominanceFrontiers(leda::array<ZfCDominatorTree*>& DominatorTree) {
     for (int i = 0; i < DominatorTree.size(); ++i) {
         // Steps 1 and 2: the nodes of the tree in breadth-first order. The distances are kept for
         // each tree apart: one array of the whole graph would be wiped once for each procedure.
@@ -127,7 +126,10 @@ leda::list<ZfCCfgVariable*> ZfCControlFlowGraph::getDefinedVariables(
                 pNodes = ZfCCfgFactory::getInstance()->createLedaList_Node();
                 VarList.append(pVariable);
             }
-            pNodes->append(x);
+            // A second entry of the same node would have no effect.
+            if (pNodes->empty() || pNodes->back() != x) {
+                pNodes->append(x);
+            }
         }
     }
     // Step 3.

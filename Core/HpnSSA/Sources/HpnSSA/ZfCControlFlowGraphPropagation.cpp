@@ -16,10 +16,17 @@
 // function that changes sends no SSA edges; its users follow in the next iteration. Each of these
 // keeps a value from being called constant too early.
 //
+// Departure, in cost alone: whether a block has an executable in-edge is read from its visited
+// mark. Flags and marks are cleared together, and whoever sets the flag of an edge into a block
+// marks the block, so the mark says the same as a count over the in-edges and does not take the
+// square of them at a wide join.
+//
 // An iteration is linear in the edges of both kinds and in how often a value changes, which is at
 // most a few times for each variable.
 
 #include "ZfCControlFlowGraph.h"
+
+#include "ZfCInternalCheck.h"
 
 void ZfCControlFlowGraph::propagateSparseConditionalConstant(bool RemoveDeadCode) {
     addSSAEdges();
@@ -90,9 +97,13 @@ int ZfCControlFlowGraph::countCfgOutEdges(leda::node Node) {
     return Count;
 }
 
-void ZfCControlFlowGraph::setVisited(leda::node Node) { m_Visited[Node] = true; }
+void ZfCControlFlowGraph::setVisited(leda::node Node) {
+    m_Visited[Node] = true;
+}
 
-bool ZfCControlFlowGraph::isVisited(leda::node Node) { return m_Visited[Node]; }
+bool ZfCControlFlowGraph::isVisited(leda::node Node) {
+    return m_Visited[Node];
+}
 
 void ZfCControlFlowGraph::clearAllVisited() {
     for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
@@ -121,20 +132,22 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
         leda::node Target = target(e);
         // Step 3c2: a phi function is visited over each edge, anything else on first arrival.
         if (ZfCBasicBlock* pBlock = inf(Target)->isBasicBlock()) {
+            bool IsFirstArrival = !isVisited(Target);
             setVisited(Target);
             if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
                 visitPhiFunction(pPhi, Target, FoundNewConstant);
-            } else if (countExecutableInEdges(Target) == 1) {
+            } else if (IsFirstArrival) {
+                ZF_ASSERT(countExecutableInEdges(Target) == 1);
                 visitInstruction(pBlock, Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
             }
         }
         // Step 3c3: without a branch, control goes on.
         if (countCfgOutEdges(Target) == 1) {
-            for (leda::edge f = first_adj_edge(Target); f != nullptr; f = adj_succ(f)) {
-                if (inf(f)->isSSAEdge() == nullptr) {
-                    CfgEdgeList.append(f);
-                }
+            leda::edge f = first_adj_edge(Target);
+            while (inf(f)->isSSAEdge() != nullptr) {
+                f = adj_succ(f);
             }
+            CfgEdgeList.append(f);
         }
     };
     auto ServeSSAEdge = [&](leda::edge e) {
@@ -142,7 +155,8 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
         ZfCBasicBlock* pBlock = inf(Target)->isBasicBlock();
         if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
             visitPhiFunction(pPhi, Target, FoundNewConstant);
-        } else if (countExecutableInEdges(Target) >= 1) {
+        } else if (isVisited(Target)) {
+            ZF_ASSERT(countExecutableInEdges(Target) >= 1);
             visitInstruction(pBlock, Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
         }
         // Otherwise the change waits until control reaches the use.

@@ -6,9 +6,9 @@
 //    holds for this edge alone, also where the arm begins at a join.
 //
 // The statements are virtual: they make no code, and the versions they define are aliases of the
-// stored variable. Summaries pass over them. (M. N. Wegman and F. K. Zadeck, Constant propagation
-// with conditional branches, ACM Transactions on Programming Languages and Systems 13(2), 1991,
-// section 5, suggest assignments like these.)
+// stored variable. Summaries pass over them. They have no step of their own in the propagation; J.
+// R. C. Patterson, Accurate static branch prediction by value range propagation, PLDI 1995, makes
+// branches speak in the same way.
 //
 // Linear in the nodes.
 

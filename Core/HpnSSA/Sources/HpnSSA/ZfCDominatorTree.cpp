@@ -1,6 +1,7 @@
 #include "ZfCDominatorTree.h"
 
-ZfCDominatorTree::ZfCDominatorTree() : m_pRoot(nullptr) {}
+ZfCDominatorTree::ZfCDominatorTree() : m_pRoot(nullptr) {
+}
 
 ZfCDominatorTree::ZfCDominatorTree(ZfCDominatorTree const& Other) = default;
 
@@ -8,6 +9,10 @@ ZfCDominatorTree& ZfCDominatorTree::operator=(ZfCDominatorTree const& Other) = d
 
 ZfCDominatorTree::~ZfCDominatorTree() = default;
 
-leda::node ZfCDominatorTree::getRoot() { return m_pRoot; }
+leda::node ZfCDominatorTree::getRoot() {
+    return m_pRoot;
+}
 
-void ZfCDominatorTree::setRoot(leda::node Root) { m_pRoot = Root; }
+void ZfCDominatorTree::setRoot(leda::node Root) {
+    m_pRoot = Root;
+}
