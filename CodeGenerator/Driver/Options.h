@@ -1,0 +1,42 @@
+#ifndef OPTIONS_H
+#define OPTIONS_H
+
+#include "Road/PassSequence.h"
+
+#include <string>
+#include <vector>
+
+namespace hpn {
+
+/// What the process ends with.
+enum ExitStatus { ExitDone = 0, ExitProgramMistakes = 1, ExitWrongUse = 2, ExitInternalError = 3 };
+
+enum class StatisticsForm : unsigned char { None, Text, Json };
+
+/// What the user asked for.
+struct Options {
+    std::vector<std::string> Files; ///< "-": standard input
+    std::string OutputFile;         ///< empty or "-": standard output
+    PassSequence Passes;
+    std::string DotDirectory; ///< empty: no dump
+    std::string HtmlDirectory;
+    StatisticsForm Statistics = StatisticsForm::None;
+    bool IsTimeWanted = false;
+    bool IsCheckWanted = false;
+    bool IsRangesWanted = false;
+    bool IsPrintWanted = false;
+
+    bool isOutputToFile() const { return !OutputFile.empty() && OutputFile != "-"; }
+};
+
+/// Reads the command line. False: the process ends now with `Status`; help, version or the mistake
+/// has been printed.
+bool parseOptions(int ArgumentCount, const char* const* pArguments, Options& Result,
+                  ExitStatus& Status);
+
+/// Prints one line "hpncg: error: ..." to the error stream.
+void reportWrongUse(const std::string& Message);
+
+} // namespace hpn
+
+#endif

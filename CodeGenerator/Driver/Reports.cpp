@@ -1,0 +1,96 @@
+#include "Driver/Reports.h"
+
+#include <nlohmann/json.hpp>
+
+#include <cstdarg>
+#include <cstdio>
+
+namespace hpn {
+
+namespace {
+
+// A line of a report by a format of printf; lines are short.
+[[gnu::format(printf, 2, 3)]] void appendLine(std::string& Text, const char* Format, ...) {
+    char Line[256];
+    va_list Arguments;
+    va_start(Arguments, Format);
+    std::vsnprintf(Line, sizeof Line, Format, Arguments);
+    va_end(Arguments);
+    Text += Line;
+    Text += '\n';
+}
+
+void appendCounts(std::string& Text, const char* Name, const GraphCounts& Counts) {
+    appendLine(Text, "%-36s %10zu %10zu %10zu %10zu %10zu", Name, Counts.Statements,
+               Counts.Conditions, Counts.Procedures, Counts.Blocks, Counts.Nodes);
+}
+
+// The single figures, under the names that both forms of the report use.
+struct Figure {
+    const char* Key;
+    const char* Title;
+    std::size_t Statistics::*pValue;
+};
+
+const Figure Figures[] = {
+    {"proceduresInlined", "procedures inlined", &Statistics::ProceduresInlined},
+    {"recursiveProcedures", "  not inlined: call themselves", &Statistics::RecursiveProcedures},
+    {"exportedProcedures", "  not inlined: called from outside", &Statistics::ExportedProcedures},
+    {"conditionAssignments", "condition assignments made", &Statistics::ConditionAssignments},
+    {"iterations", "iterations of the propagation", &Statistics::Iterations},
+    {"constantsFound", "constants found (versions)", &Statistics::ConstantsFound},
+    {"deadNodesRemoved", "dead nodes removed", &Statistics::DeadNodesRemoved},
+    {"unusedDefinitionsRemoved", "unused definitions removed",
+     &Statistics::UnusedDefinitionsRemoved},
+    {"statementsHoisted", "statements hoisted", &Statistics::StatementsHoisted},
+};
+
+nlohmann::ordered_json toJson(const GraphCounts& Counts) {
+    return {{"statements", Counts.Statements}, {"conditions", Counts.Conditions},
+            {"procedures", Counts.Procedures}, {"blocks", Counts.Blocks},
+            {"nodes", Counts.Nodes},           {"edges", Counts.Edges}};
+}
+
+} // namespace
+
+std::string printStatistics(const Statistics& Counts) {
+    std::string Text;
+    appendLine(Text, "%-36s %10s %10s %10s %10s %10s", "", "statements", "conditions", "procedures",
+               "blocks", "nodes");
+    appendCounts(Text, "as written", Counts.Before);
+    for (const Statistics::Record& Each : Counts.Passes)
+        appendCounts(Text, Each.PassName, Each.After);
+    Text += '\n';
+    for (const Figure& Each : Figures)
+        appendLine(Text, "%-36s %10zu", Each.Title, Counts.*Each.pValue);
+    return Text;
+}
+
+std::string printStatisticsAsJson(const Statistics& Counts, const std::string& ProgramName) {
+    nlohmann::ordered_json Root;
+    Root["program"] = ProgramName;
+    Root["before"] = toJson(Counts.Before);
+    Root["after"] = toJson(Counts.After);
+    for (const Figure& Each : Figures)
+        Root[Each.Key] = Counts.*Each.pValue;
+    Root["passes"] = nlohmann::ordered_json::array();
+    for (const Statistics::Record& Each : Counts.Passes)
+        Root["passes"].push_back({{"name", Each.PassName}, {"after", toJson(Each.After)}});
+    using Handler = nlohmann::ordered_json::error_handler_t;
+    return Root.dump(2, ' ', false, Handler::replace) + "\n";
+}
+
+std::string TimeObserver::print() const {
+    double Total = 0.0;
+    for (const PassStep& Step : m_Steps)
+        Total += Step.Seconds;
+    std::string Text;
+    appendLine(Text, "%-36s %12s %7s", "pass", "seconds", "share");
+    for (const PassStep& Step : m_Steps)
+        appendLine(Text, "%-36s %12.6f %6.1f%%", Step.pPass->Name, Step.Seconds,
+                   Total > 0.0 ? 100.0 * Step.Seconds / Total : 0.0);
+    appendLine(Text, "%-36s %12.6f", "all passes", Total);
+    return Text;
+}
+
+} // namespace hpn

@@ -1,0 +1,182 @@
+#include "Driver/Session.h"
+
+#include "Driver/InternalErrors.h"
+#include "Driver/OutputFiles.h"
+#include "Driver/Progress.h"
+#include "Driver/Reports.h"
+#include "Emitter/CEmitter.h"
+#include "Graph/ProgramGraph.h"
+#include "Language/Printer.h"
+#include "Language/Reader.h"
+#include "Model/PendingWarnings.h"
+#include "Road/GraphDump.h"
+#include "Road/PassRunner.h"
+#include "Road/RangeTable.h"
+#include "Road/Statistics.h"
+
+#include <cstdio>
+#include <filesystem>
+#include <string_view>
+
+namespace hpn {
+
+extern const char* const RuntimeHeaderText;
+
+namespace {
+
+const char* const RuntimeHeaderName = "hpn_runtime.h";
+
+bool readSources(const Options& Wanted, SourceFiles& Sources) {
+    for (const std::string& Name : Wanted.Files) {
+        std::string Why;
+        if (Name == "-" ? Sources.addStandardInput(Why) : Sources.addFile(Name, Why))
+            continue;
+        reportWrongUse("cannot read '" + Name + "': " + Why);
+        return false;
+    }
+    return true;
+}
+
+bool makeDirectory(const std::string& Directory) {
+    std::error_code Error;
+    if (!Directory.empty())
+        std::filesystem::create_directories(Directory, Error);
+    if (Error)
+        reportWrongUse("cannot make the directory '" + Directory + "': " + Error.message());
+    return !Error;
+}
+
+// The code with the text of the runtime header in the place of its include.
+std::string insertRuntime(const std::string& Source) {
+    const std::string Include = std::string("#include \"") + RuntimeHeaderName + "\"\n";
+    const std::size_t Place = Source.find(Include);
+    if (Place == std::string::npos)
+        return Source;
+    std::string Text = Source;
+    return Text.replace(Place, Include.size(), RuntimeHeaderText);
+}
+
+bool writeFiles(const Options& Wanted, const std::string& Source, bool NeedsRuntime) {
+    const std::string Runtime = RuntimeHeaderText;
+    OutputFiles Files;
+    Files.add(Wanted.OutputFile, Source);
+    const std::string Header =
+        (std::filesystem::path(Wanted.OutputFile).parent_path() / RuntimeHeaderName).string();
+    // A header that is there already keeps its time, so that nothing is built again for it.
+    if (NeedsRuntime && !holdsText(Header, Runtime))
+        Files.add(Header, Runtime);
+    std::string Why;
+    if (Files.write(Why))
+        return true;
+    reportWrongUse(Why);
+    return false;
+}
+
+ExitStatus writeToStandardOutput(const std::string& Text) {
+    if (writeStandardOutput(Text))
+        return ExitDone;
+    reportWrongUse("cannot write to standard output");
+    return ExitWrongUse;
+}
+
+ExitStatus writeText(const Options& Wanted, const std::string& Text) {
+    if (!Wanted.isOutputToFile())
+        return writeToStandardOutput(Text);
+    return writeFiles(Wanted, Text, false) ? ExitDone : ExitWrongUse;
+}
+
+// What the expressions found strange while the passes ran.
+void printWarnings(const SourceFiles& Sources) {
+    Diagnostics Messages(Sources);
+    for (const PendingWarning& Each : pendingWarnings())
+        Messages.warning(Each.Position, Each.Text);
+    pendingWarnings().clear();
+    std::fputs(Messages.print().c_str(), stderr);
+}
+
+// The observers of one run, as far as they are wanted.
+struct Watchers {
+    Watchers(const Options& Wanted, PassRunner& Runner, InternalErrors& Errors)
+        : Dump(Wanted.DotDirectory, Wanted.HtmlDirectory) {
+        if (Wanted.Statistics != StatisticsForm::None)
+            Runner.addObserver(Counts);
+        if (Wanted.IsRangesWanted)
+            Runner.addObserver(Ranges);
+        Runner.addObserver(Dump);
+        Runner.addObserver(Times);
+        Runner.addObserver(Errors);
+        Runner.addObserver(Progress);
+    }
+
+    std::string report(const Options& Wanted, const SourceFiles& Sources,
+                       const Program& Source) const {
+        std::string Text;
+        if (Wanted.Statistics == StatisticsForm::Text)
+            Text += printStatistics(Counts.getStatistics());
+        if (Wanted.Statistics == StatisticsForm::Json)
+            Text += printStatisticsAsJson(Counts.getStatistics(), Source.Name);
+        if (Wanted.IsRangesWanted)
+            Text += printRanges(Ranges.getRows(), Sources);
+        if (Wanted.IsTimeWanted)
+            Text += Times.print();
+        return Text;
+    }
+
+    StatisticsObserver Counts;
+    RangeObserver Ranges;
+    DumpObserver Dump;
+    TimeObserver Times;
+    ProgressObserver Progress;
+};
+
+ExitStatus writeResults(const Options& Wanted, const EmittedProgram& Code,
+                        const std::string& Report) {
+    if (!Wanted.isOutputToFile()) {
+        std::fputs(Report.c_str(), stderr);
+        return writeToStandardOutput(insertRuntime(Code.Source));
+    }
+    // The report first: what fails then, fails before a file has been touched.
+    if (writeToStandardOutput(Report) != ExitDone)
+        return ExitWrongUse;
+    return writeFiles(Wanted, Code.Source, Code.NeedsRuntime) ? ExitDone : ExitWrongUse;
+}
+
+ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Program& Source) {
+    InternalErrors Errors(Wanted.IsCheckWanted);
+    ProgramGraph Graph(Source);
+    PassRunner Runner(Graph);
+    Watchers Watching(Wanted, Runner, Errors);
+    if (!makeDirectory(Wanted.DotDirectory) || !makeDirectory(Wanted.HtmlDirectory))
+        return ExitWrongUse;
+    const bool IsRun = Runner.run(Wanted.Passes);
+    printWarnings(Sources);
+    if (!Watching.Dump.getFailedFile().empty()) {
+        reportWrongUse("cannot write '" + Watching.Dump.getFailedFile() + "'");
+        return ExitWrongUse;
+    }
+    if (!IsRun)
+        return ExitInternalError;
+    const EmittedProgram Code = emitProgram(Graph);
+    if (Errors.hasAny())
+        return ExitInternalError;
+    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source));
+}
+
+} // namespace
+
+ExitStatus runSession(const Options& Wanted) {
+    SourceFiles Sources;
+    if (!readSources(Wanted, Sources))
+        return ExitWrongUse;
+    Diagnostics Messages(Sources);
+    Program Source;
+    const bool IsRead = readProgram(Sources, Messages, Source);
+    std::fputs(Messages.print().c_str(), stderr);
+    if (!IsRead)
+        return ExitProgramMistakes;
+    if (Wanted.IsPrintWanted)
+        return writeText(Wanted, printProgram(Source));
+    return optimise(Wanted, Sources, Source);
+}
+
+} // namespace hpn

@@ -1,0 +1,233 @@
+#include "Emitter/VariableUse.h"
+
+#include "Emitter/FlowDominators.h"
+#include "Model/ZfCCfgSFExpression.h"
+#include "Model/ZfCCfgSFProcedureCall.h"
+
+#include <unordered_map>
+
+namespace hpn {
+
+namespace {
+
+/// Shows each variable that a term reads; of an element store that is not the array.
+template <class Visit>
+void forEachRead(const Term* pTerm, Visit&& visit) {
+    if (pTerm->pVariable && !pTerm->IsStore)
+        visit(declarationOf(pTerm->pVariable));
+    if (pTerm->pLeft)
+        forEachRead(pTerm->pLeft, visit);
+    if (pTerm->pRight)
+        forEachRead(pTerm->pRight, visit);
+}
+
+template <class Visit>
+void forEachArgumentRead(const FlowItem& Item, Visit&& visit) {
+    if (!Item.pCall)
+        return;
+    for (const ZfCCfgSFProcedureCall::Argument& Argument : Item.pCall->getArguments())
+        if (ZfCCfgSFExpression* pExpression = Argument.pExpression->isSFExpression())
+            forEachRead(pExpression->getRoot(), visit);
+}
+
+} // namespace
+
+VariableUse::Record& VariableUse::note(int Function, const Variable* pVariable) {
+    if (pVariable->Index >= m_Records.size())
+        m_Records.resize(pVariable->Index + 1);
+    Record& Noted = m_Records[pVariable->Index];
+    if (Noted.Function == Nowhere) {
+        Noted.Function = Function;
+        m_All.push_back(pVariable);
+    } else if (Noted.Function != Function) {
+        Noted.Function = Several;
+    }
+    return Noted;
+}
+
+void VariableUse::addRead(int Function, const Variable* pVariable) {
+    note(Function, pVariable).IsRead = true;
+}
+
+void VariableUse::addWrite(int Function, const Variable* pVariable) {
+    note(Function, pVariable);
+}
+
+namespace {
+
+class NoNames : public VariableNames {
+public:
+    std::string_view nameOf(const Variable& Declaration) const override { return Declaration.Name; }
+};
+
+/// Something in the term could be written as a number though it reads variables, and it would
+/// matter: a read of a variable that is only declared if it is read.
+bool mayLoseReads(const Term* pTerm, bool& ReadsOwn, bool& Folds) {
+    if (pTerm->pVariable) {
+        const VariableKind Kind = declarationOf(pTerm->pVariable)->Kind;
+        ReadsOwn = ReadsOwn || Kind == VariableKind::Local || Kind == VariableKind::Formal ||
+                   Kind == VariableKind::Param;
+    }
+    const bool IsPlain = pTerm->Op == Operator::Number || pTerm->Op == Operator::Variable ||
+                         pTerm->Op == Operator::Element || pTerm->Op == Operator::Add ||
+                         pTerm->Op == Operator::Subtract;
+    const bool Clips = pTerm->pType && (pTerm->pType->SaturatesHigh || pTerm->pType->SaturatesLow);
+    Folds = Folds || Clips || !(IsPlain || pTerm->Op == Operator::Cast);
+    for (const Term* pOperand : {pTerm->pLeft, pTerm->pRight})
+        if (pOperand && !(ReadsOwn && Folds))
+            mayLoseReads(pOperand, ReadsOwn, Folds);
+    return ReadsOwn && Folds;
+}
+
+} // namespace
+
+template <class Write>
+void VariableUse::addReads(int Function, const Term* pTerm, Write&& write) {
+    bool ReadsOwn = false;
+    bool Folds = false;
+    if (!mayLoseReads(pTerm, ReadsOwn, Folds))
+        return forEachRead(pTerm, [&](const Variable* pVariable) { addRead(Function, pVariable); });
+    m_Scratch.clear();
+    const NoNames Names;
+    ExpressionWriter Writer(Names, m_Scratch);
+    write(Writer);
+    for (const Variable* pVariable : Writer.getReads())
+        addRead(Function, pVariable);
+}
+
+void VariableUse::addArgument(int Function, const Term* pTerm, const Variable* pFormal) {
+    addReads(Function, pTerm,
+             [&](ExpressionWriter& Writer) { Writer.writeStored(pTerm, *pFormal->pType, true); });
+}
+
+void VariableUse::add(int Function, const ProcedureFlow& Flow) {
+    for (const FlowItem& Item : Flow.Items) {
+        if (Item.pTerm)
+            addReads(Function, Item.pTerm, [&](ExpressionWriter& Writer) {
+                if (Item.pTerm->IsStore)
+                    Writer.writeElement(*Item.pTarget, Item.pTerm->pLeft);
+                const Term* pValue = Item.pTerm->IsStore ? Item.pTerm->pRight : Item.pTerm;
+                if (Item.Kind == FlowItemKind::Assign)
+                    Writer.writeStored(pValue, *Item.pTarget->pType, true);
+                else
+                    Writer.writeDiscarded(pValue);
+            });
+        if (Item.pTarget && Item.Kind == FlowItemKind::Assign)
+            addWrite(Function, Item.pTarget);
+    }
+    for (const Term* pCondition : Flow.Conditions)
+        if (pCondition)
+            addReads(Function, pCondition,
+                     [&](ExpressionWriter& Writer) { Writer.writeCondition(pCondition, false); });
+}
+
+// ---- liveness ----
+
+namespace {
+
+/// Backward search for each variable on its own: from the nodes that read it before they write it,
+/// through those that do not write it. Linear in the sum of the live ranges.
+class EntryLiveness {
+public:
+    EntryLiveness(const ProcedureFlow& Flow, const std::vector<const Variable*>& Candidates);
+    std::vector<const Variable*> find();
+
+private:
+    struct Places {
+        std::vector<int> Exposed; // nodes that read it before they write it
+        std::vector<int> Written; // nodes that write it
+    };
+
+    void scan(int Node);
+    void read(int Node, const Variable* pVariable);
+    void write(int Node, const Variable* pVariable);
+    bool reachesEntry(const Places& Of);
+
+    const ProcedureFlow& m_Flow;
+    const std::vector<const Variable*>& m_Candidates;
+    std::unordered_map<const Variable*, Places> m_Places; // looked up only, never walked
+    FlowDominators m_Order;                               // for the predecessors
+    std::vector<std::size_t> m_SeenFor;
+    std::size_t m_Search = 0;
+};
+
+EntryLiveness::EntryLiveness(const ProcedureFlow& Flow,
+                             const std::vector<const Variable*>& Candidates)
+    : m_Flow(Flow), m_Candidates(Candidates), m_Order(Flow.Nodes), m_SeenFor(Flow.Nodes.size(), 0) {
+    for (const Variable* pVariable : Candidates)
+        m_Places[pVariable];
+    for (std::size_t i = 0; i < Flow.Nodes.size(); ++i)
+        scan(static_cast<int>(i));
+}
+
+void EntryLiveness::read(int Node, const Variable* pVariable) {
+    const auto Found = m_Places.find(pVariable);
+    if (Found == m_Places.end())
+        return;
+    Places& Of = Found->second;
+    if (Of.Written.empty() || Of.Written.back() != Node)
+        if (Of.Exposed.empty() || Of.Exposed.back() != Node)
+            Of.Exposed.push_back(Node);
+}
+
+void EntryLiveness::write(int Node, const Variable* pVariable) {
+    const auto Found = m_Places.find(pVariable);
+    if (Found != m_Places.end() &&
+        (Found->second.Written.empty() || Found->second.Written.back() != Node))
+        Found->second.Written.push_back(Node);
+}
+
+void EntryLiveness::scan(int Node) {
+    const auto reads = [&](const Variable* pVariable) { read(Node, pVariable); };
+    for (std::size_t i = m_Flow.FirstItem[Node]; i < m_Flow.FirstItem[Node + 1]; ++i) {
+        const FlowItem& Item = m_Flow.Items[i];
+        if (Item.pTerm)
+            forEachRead(Item.pTerm, reads);
+        forEachArgumentRead(Item, reads);
+        if (Item.pTarget)
+            write(Node, Item.pTarget);
+    }
+    if (m_Flow.Conditions[Node])
+        forEachRead(m_Flow.Conditions[Node], reads);
+}
+
+bool EntryLiveness::reachesEntry(const Places& Of) {
+    // Nodes that write it are marked as stops of this search, nodes that were passed as done.
+    const std::size_t Stop = ++m_Search;
+    for (int Node : Of.Written)
+        m_SeenFor[Node] = Stop;
+    std::vector<int> WorkList(Of.Exposed);
+    while (!WorkList.empty()) {
+        const int Node = WorkList.back();
+        WorkList.pop_back();
+        if (Node == 0)
+            return true;
+        for (const int* p = m_Order.beginPredecessors(Node); p != m_Order.endPredecessors(Node);
+             ++p) {
+            if (m_SeenFor[*p] == Stop)
+                continue;
+            m_SeenFor[*p] = Stop;
+            WorkList.push_back(*p);
+        }
+    }
+    return false;
+}
+
+std::vector<const Variable*> EntryLiveness::find() {
+    std::vector<const Variable*> Result;
+    for (const Variable* pVariable : m_Candidates)
+        if (reachesEntry(m_Places[pVariable]))
+            Result.push_back(pVariable);
+    return Result;
+}
+
+} // namespace
+
+std::vector<const Variable*> liveAtEntry(const ProcedureFlow& Flow,
+                                         const std::vector<const Variable*>& Candidates) {
+    if (Flow.Nodes.empty() || Candidates.empty())
+        return {};
+    return EntryLiveness(Flow, Candidates).find();
+}
+
+} // namespace hpn

@@ -1,0 +1,64 @@
+#include "Graph/ProgramGraph.h"
+
+#include "Graph/GraphBuilder.h"
+#include "ZfCCfgExternCall.h"
+#include "ZfCCfgProcedure.h"
+
+namespace hpn {
+
+ProgramGraph::ProgramGraph(const Program& Source) : m_Source(Source), m_Hidden(Source) {
+    m_Control.boot();
+    m_pGraph = std::make_unique<ZfCControlFlowGraph>();
+    for (const Procedure& Known : Source.Procedures) {
+        if (!Known.IsMain)
+            m_Procedures.emplace(Known.Name, &Known);
+    }
+    GraphBuilder(*this).build();
+}
+
+// The graph's end empties the factory, whose versions still name the client's variables; the
+// variables' sets of nodes use the library until they end.
+ProgramGraph::~ProgramGraph() {
+    m_pGraph.reset();
+    m_Variables.clear();
+    m_Control.shutdown();
+}
+
+ZfCCfgSFVariable* ProgramGraph::getVariable(const Variable& Declaration) const {
+    return m_Variables[Declaration.Index].get();
+}
+
+const Extern* ProgramGraph::getExtern(const ZfCCfgExternCall* pCall) const {
+    const auto Found = m_Externs.find(pCall);
+    return Found != m_Externs.end() ? Found->second : nullptr;
+}
+
+bool ProgramGraph::isNeverLeft(const ZfCCfgExpression* pCondition) const {
+    return m_NeverLeft.count(pCondition) != 0;
+}
+
+const Procedure* ProgramGraph::findProcedure(const char* Name) const {
+    const std::string_view Wanted = Name;
+    if (Wanted == "#main")
+        return m_Source.pMain;
+    const auto Found = m_Procedures.find(Wanted);
+    return Found != m_Procedures.end() ? Found->second : nullptr;
+}
+
+void ProgramGraph::appendCalls() {
+    for (leda::node v : m_pGraph->all_nodes()) {
+        ZfCBasicBlock* pBlock = (*m_pGraph)[v]->isBasicBlock();
+        if (pBlock == nullptr)
+            continue;
+        for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq()) {
+            ZfCCfgProcedureCall* pCall = pStatement->isProcedureCall();
+            if (pCall == nullptr)
+                continue;
+            ZfCCfgProcedure* pCallee = nullptr;
+            m_pGraph->demandProcedureEntryNode(pCall->getName(), pCallee);
+            pCallee->appendCall(pCall);
+        }
+    }
+}
+
+} // namespace hpn

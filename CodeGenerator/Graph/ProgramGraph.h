@@ -1,0 +1,73 @@
+#ifndef PROGRAMGRAPH_H
+#define PROGRAMGRAPH_H
+
+#include "Graph/HiddenVariables.h"
+#include "Language/Program.h"
+#include "Model/Term.h"
+#include "Model/ZfCCfgSFVariable.h"
+#include "ZfCControlFlowGraph.h"
+#include "ZfCSSAControl.h"
+
+#include <deque>
+#include <memory>
+#include <string_view>
+#include <unordered_map>
+#include <unordered_set>
+#include <vector>
+
+class ZfCCfgExternCall;
+class ZfCCfgProcedure;
+
+namespace hpn {
+
+/// One run of the optimiser on one program: boots the library, owns the graph, the client's
+/// variables and the terms, and takes all of it down again in the right order (graph, variables,
+/// shutdown). One at a time in a process.
+class ProgramGraph {
+public:
+    /// Boots the library and fills the graph from a checked program, which must outlive this
+    /// object: one component for each procedure, every block stamped, every call at the end of a
+    /// block of its own, entries set, no exit nodes yet.
+    explicit ProgramGraph(const Program& Source);
+    ~ProgramGraph();
+    ProgramGraph(const ProgramGraph&) = delete;
+    ProgramGraph& operator=(const ProgramGraph&) = delete;
+
+    const Program& getProgram() const { return m_Source; }
+    ZfCControlFlowGraph& getGraph() { return *m_pGraph; }
+    TermArena& getTerms() { return m_Terms; }
+    ZfCCfgSFVariable* getVariable(const Variable& Declaration) const;
+    /// Locals that the source does not name, in order of making; `pOwner` is the procedure that
+    /// they were made in.
+    const std::deque<Variable>& getHiddenVariables() const { return m_Hidden.getAll(); }
+    /// The declaration behind an extern call statement.
+    const Extern* getExtern(const ZfCCfgExternCall* pCall) const;
+    /// A branch condition that was only put in as a way out that is never taken: the true edge is
+    /// always followed. Not emitted.
+    bool isNeverLeft(const ZfCCfgExpression* pCondition) const;
+    /// Name of the procedure that stands for all callers outside ("#outside"): never emitted.
+    static const char* outsideProcedureName() { return "#outside"; }
+    /// The source procedure behind a procedure's name on the graph ("#main" for main), or null
+    /// (outside, extracted ones).
+    const Procedure* findProcedure(const char* Name) const;
+    /// Registers every call on the graph at its callee (for a road without `inlineProcedures`,
+    /// which does it itself).
+    void appendCalls();
+
+private:
+    friend class GraphBuilder;
+    const Program& m_Source;
+    ZfCSSAControl m_Control;
+    std::unique_ptr<ZfCControlFlowGraph> m_pGraph;
+    HiddenVariables m_Hidden;
+    std::vector<std::unique_ptr<ZfCCfgSFVariable>>
+        m_Variables; // by Variable::Index, hidden ones behind the others
+    std::unordered_map<std::string_view, const Procedure*> m_Procedures;
+    TermArena m_Terms;
+    std::unordered_map<const ZfCCfgExternCall*, const Extern*> m_Externs;
+    std::unordered_set<const ZfCCfgExpression*> m_NeverLeft;
+};
+
+} // namespace hpn
+
+#endif

@@ -1,0 +1,223 @@
+#include "Model/Conversion.h"
+
+#include "Model/Arithmetic.h"
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+
+// A conversion is a clip, then a monotone step from the number to a whole raw number (truncation,
+// or rounding to the grid), then a wrap. Each of these steps is done in IEEE arithmetic, whose
+// rounding is monotone: of two numbers the smaller never converts to the greater raw number before
+// the wrap. That is why the ends of a range, converted like numbers, are the exact ends of what its
+// numbers convert to, as long as nothing wraps between them.
+
+namespace hpn {
+
+namespace {
+
+constexpr double Infinity = std::numeric_limits<double>::infinity();
+
+unsigned bitsOf(BaseType Base) {
+    switch (Base) {
+    case BaseType::Bool:
+        return 1;
+    case BaseType::Int8:
+    case BaseType::UInt8:
+        return 8;
+    case BaseType::Int16:
+    case BaseType::UInt16:
+        return 16;
+    default:
+        return 32;
+    }
+}
+
+bool isSigned(BaseType Base) {
+    return Base == BaseType::Int8 || Base == BaseType::Int16 || Base == BaseType::Int32;
+}
+
+/// Keeps the low bits of a raw number as the storage does.
+std::int64_t wrapRaw(std::int64_t Raw, BaseType Base) {
+    const unsigned Bits = bitsOf(Base);
+    const std::uint64_t Mask = (std::uint64_t{1} << Bits) - 1;
+    const auto Low = static_cast<std::int64_t>(static_cast<std::uint64_t>(Raw) & Mask);
+    if (isSigned(Base) && Low > greatestRaw(Base))
+        return Low - (std::int64_t{1} << Bits);
+    return Low;
+}
+
+/// The whole number, still as a double, that a number steps to before it is wrapped.
+double stepToWhole(double Number, const Type& To) {
+    return isScaled(To) ? std::round((Number - To.Offset) / To.Lsb) : std::trunc(Number);
+}
+
+/// Signed types without scaling go through 32 bits, all others through 64.
+bool goesThrough32(const Type& To) {
+    return isSigned(To.Base) && !isScaled(To);
+}
+
+std::int64_t rawOfWhole(double Whole, const Type& To) {
+    return wrapRaw(goesThrough32(To) ? truncateTo32(Whole) : truncateTo64(Whole), To.Base);
+}
+
+double convertInStorage(double Number, const Type& To) {
+    switch (To.Base) {
+    case BaseType::Float64:
+        return Number + 0.0; // the sum of -0.0 and 0.0 is 0.0
+    case BaseType::Float32:
+        return roundToSingle(Number) + 0.0;
+    case BaseType::Bool:
+        return Number != 0.0 ? 1.0 : 0.0;
+    default:
+        return numberOfRaw(rawOfWhole(stepToWhole(Number, To), To), To);
+    }
+}
+
+ValueRange interval(double Low, double High, bool IsIntegral) {
+    ValueRange Result;
+    Result.Low = Low + 0.0;
+    Result.High = High + 0.0;
+    const bool IsWholeNumber = Low == High && std::trunc(Low) == Low;
+    Result.IsIntegral = (IsIntegral || IsWholeNumber) && Low > -Infinity && High < Infinity;
+    return Result;
+}
+
+ValueRange emptyRange() {
+    ValueRange Result;
+    Result.Low = Infinity;
+    Result.High = -Infinity;
+    Result.IsIntegral = true;
+    return Result;
+}
+
+/// Numbers of an interval of raw numbers that lies in the storage.
+ValueRange intervalOfRaws(std::int64_t Low, std::int64_t High, const Type& Of) {
+    const bool IsWholeGrid =
+        !isScaled(Of) || (std::trunc(Of.Lsb) == Of.Lsb && std::trunc(Of.Offset) == Of.Offset);
+    return interval(numberOfRaw(Low, Of), numberOfRaw(High, Of), IsWholeGrid);
+}
+
+/// Wraps an interval of raw numbers: it stays together if it crosses no border of the storage's
+/// period, else everything is possible.
+ValueRange wrapInterval(std::int64_t Low, std::int64_t High, const Type& To) {
+    const std::int64_t WrappedLow = wrapRaw(Low, To.Base);
+    const std::int64_t WrappedHigh = wrapRaw(High, To.Base);
+    // The width is compared unsigned: it can exceed the signed range.
+    const std::uint64_t Width = static_cast<std::uint64_t>(High) - static_cast<std::uint64_t>(Low);
+    const std::uint64_t Period = std::uint64_t{1} << bitsOf(To.Base);
+    if (Width < Period && WrappedLow <= WrappedHigh)
+        return intervalOfRaws(WrappedLow, WrappedHigh, To);
+    return intervalOfRaws(smallestRaw(To.Base), greatestRaw(To.Base), To);
+}
+
+/// Numbers in [Low, High] to an integer storage: those in reach of the intermediate integer wrap,
+/// those out of reach all become its smallest number.
+ValueRange convertToInteger(double Low, double High, const Type& To) {
+    const double WholeLow = stepToWhole(Low, To);
+    const double WholeHigh = stepToWhole(High, To);
+    const double Smallest = goesThrough32(To) ? -2147483648.0 : -9223372036854775808.0;
+    const double Greatest = goesThrough32(To) ? 2147483647.0 : 9223372036854774784.0;
+    ValueRange Result = emptyRange();
+    if (WholeLow <= Greatest && WholeHigh >= Smallest)
+        Result = wrapInterval(static_cast<std::int64_t>(std::max(WholeLow, Smallest)),
+                              static_cast<std::int64_t>(std::min(WholeHigh, Greatest)), To);
+    if (WholeLow < Smallest || WholeHigh > Greatest) {
+        const std::int64_t Lost = rawOfWhole(-Infinity, To);
+        Result = hull(Result, intervalOfRaws(Lost, Lost, To));
+    }
+    return Result;
+}
+
+ValueRange convertToBool(double Low, double High) {
+    if (Low == 0.0 && High == 0.0)
+        return rangeOfNumber(0.0);
+    if (Low > 0.0 || High < 0.0)
+        return rangeOfNumber(1.0);
+    return interval(0.0, 1.0, true);
+}
+
+ValueRange convertIntervalInStorage(double Low, double High, bool IsIntegral, const Type& To) {
+    switch (To.Base) {
+    case BaseType::Float64:
+        return interval(Low, High, IsIntegral);
+    case BaseType::Float32:
+        return interval(roundToSingle(Low), roundToSingle(High), IsIntegral);
+    case BaseType::Bool:
+        return convertToBool(Low, High);
+    default:
+        return convertToInteger(Low, High, To);
+    }
+}
+
+} // namespace
+
+bool isFloating(BaseType Base) {
+    return Base == BaseType::Float32 || Base == BaseType::Float64;
+}
+
+bool isScaled(const Type& Of) {
+    return Of.IsScaled && (Of.Lsb != 1.0 || Of.Offset != 0.0);
+}
+
+std::int64_t smallestRaw(BaseType Base) {
+    return isSigned(Base) ? -(std::int64_t{1} << (bitsOf(Base) - 1)) : 0;
+}
+
+std::int64_t greatestRaw(BaseType Base) {
+    return (std::int64_t{1} << (bitsOf(Base) - (isSigned(Base) ? 1 : 0))) - 1;
+}
+
+double numberOfRaw(std::int64_t Raw, const Type& Of) {
+    const auto Number = static_cast<double>(Raw);
+    return isScaled(Of) ? Number * Of.Lsb + Of.Offset : Number;
+}
+
+std::int64_t rawOfNumber(double Number, const Type& Of) {
+    return truncateTo64(stepToWhole(Number, Of));
+}
+
+double convertNumber(double Number, const Type& To) {
+    if (To.SaturatesHigh && Number > To.Upper)
+        return To.Upper + 0.0;
+    if (To.SaturatesLow && To.Lower > Number)
+        return To.Lower + 0.0;
+    return convertInStorage(Number, To);
+}
+
+ValueRange convertRange(const ValueRange& From, const Type& To) {
+    ValueRange Result = emptyRange();
+    double Low = From.Low;
+    double High = From.High;
+    if (To.SaturatesHigh && !From.isEmpty() && High > To.Upper) {
+        Result = hull(Result, rangeOfNumber(To.Upper + 0.0));
+        High = To.Upper;
+    }
+    if (To.SaturatesLow && !From.isEmpty() && Low < To.Lower) {
+        Result = hull(Result, rangeOfNumber(To.Lower + 0.0));
+        Low = To.Lower;
+    }
+    // What the clips leave can be empty: all of the range lay beyond one limit.
+    if (Low <= High)
+        Result = hull(Result, convertIntervalInStorage(Low, High, From.IsIntegral, To));
+    if (From.MayBeNaN)
+        Result = hull(Result, rangeOfNumber(convertNumber(std::nan(""), To)));
+    return Result;
+}
+
+bool isUpperClipStable(const Type& Of) {
+    return Of.SaturatesHigh && convertRange(rangeOfAnything(), Of).High <= Of.Upper;
+}
+
+bool isLowerClipStable(const Type& Of) {
+    return Of.SaturatesLow && convertRange(rangeOfAnything(), Of).Low >= Of.Lower;
+}
+
+ValueRange storageRange(const Type& Of) {
+    // Outside code can leave a negative zero in a floating variable, a store of the program cannot.
+    if (isFloating(Of.Base))
+        return rangeOfAnything();
+    return intervalOfRaws(smallestRaw(Of.Base), greatestRaw(Of.Base), Of);
+}
+
+} // namespace hpn

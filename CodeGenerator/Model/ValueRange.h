@@ -1,0 +1,43 @@
+#ifndef VALUERANGE_H
+#define VALUERANGE_H
+
+#include "Language/Program.h"
+
+namespace hpn {
+
+/// What is known of a number at run time without knowing the number: the closed interval of the
+/// ordinary numbers it can be (infinities included), and whether it can be a NaN or a negative zero
+/// besides. An empty interval (`Low` greater than `High`) says that it can be nothing but a NaN.
+/// Both zeros count as 0.0 in the interval.
+struct ValueRange {
+    double Low = 0.0;
+    double High = 0.0;
+    bool MayBeNaN = false;
+    bool MayBeNegativeZero = false;
+    bool IsIntegral = false; ///< every number in it is a whole number (or it is empty); never true
+                             ///< with infinite ends
+
+    bool isEmpty() const { return Low > High; }
+    /// One number and nothing else: not a NaN, and of one sign if it is zero.
+    bool isSingle() const { return Low == High && !MayBeNaN && !MayBeNegativeZero; }
+    bool contains(double Number) const;
+    /// Inside [Low, High] of another, with no NaN or negative zero that the other lacks.
+    bool isWithin(const ValueRange& Other) const;
+};
+
+/// Just this number; a NaN gives the empty interval with MayBeNaN.
+ValueRange rangeOfNumber(double Number);
+/// Every double there is.
+ValueRange rangeOfAnything();
+/// Smallest range that holds both.
+ValueRange hull(const ValueRange& a, const ValueRange& b);
+
+/// What the operator gives for operands out of the given ranges. Never too narrow under the
+/// arithmetic of `Term`s; as narrow as an interval can be for nearly all operands. `Op` is one of
+/// the unary or binary operators (not Number, Variable, Element, Cast).
+ValueRange rangeOfUnary(Operator Op, const ValueRange& Operand);
+ValueRange rangeOfBinary(Operator Op, const ValueRange& Left, const ValueRange& Right);
+
+} // namespace hpn
+
+#endif

@@ -1,0 +1,194 @@
+#include "Model/ZfCCfgSFExpression.h"
+
+#include "Model/Conversion.h"
+#include "Model/PendingWarnings.h"
+#include "Model/ZfCCfgSFVariable.h"
+
+#include <cmath>
+
+using hpn::Operator;
+using hpn::Term;
+
+namespace {
+
+void collectVariables(const Term* pTerm, leda::set<ZfCCfgVariable*, leda::avl_tree>& Variables) {
+    if (pTerm == nullptr)
+        return;
+    // The array that a store writes is the left-hand side's business.
+    if (pTerm->pVariable != nullptr && !pTerm->IsStore)
+        Variables.insert(pTerm->pVariable);
+    collectVariables(pTerm->pLeft, Variables);
+    collectVariables(pTerm->pRight, Variables);
+}
+
+void replaceRead(Term* pTerm, ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
+    if (pTerm == nullptr)
+        return;
+    if (pTerm->pVariable == pOld && !pTerm->IsStore)
+        pTerm->pVariable = pNew;
+    replaceRead(pTerm->pLeft, pOld, pNew);
+    replaceRead(pTerm->pRight, pOld, pNew);
+}
+
+void becomeNumber(Term* pTerm, double Number) {
+    const hpn::SourcePosition Position = pTerm->Position;
+    *pTerm = Term();
+    pTerm->Number = Number;
+    pTerm->Position = Position;
+}
+
+void replaceConstantReads(Term* pTerm) {
+    if (pTerm == nullptr)
+        return;
+    if (pTerm->Op == Operator::Variable) {
+        const ZfCCfgValue& Value = pTerm->pVariable->getValue();
+        if (Value.isConstant())
+            becomeNumber(pTerm, Value.getValue());
+        return;
+    }
+    replaceConstantReads(pTerm->pLeft);
+    replaceConstantReads(pTerm->pRight);
+}
+
+const Term* stripCasts(const Term* pTerm) {
+    while (pTerm->Op == Operator::Cast && hpn::castChangesNothing(pTerm))
+        pTerm = pTerm->pLeft;
+    return pTerm;
+}
+
+/// Looks through conversions and negations; Negated turns over with each negation.
+const Term* stripNegations(const Term* pTerm, bool& Negated) {
+    Negated = false;
+    pTerm = stripCasts(pTerm);
+    while (pTerm->Op == Operator::LogicalNot) {
+        Negated = !Negated;
+        pTerm = stripCasts(pTerm->pLeft);
+    }
+    return pTerm;
+}
+
+/// The variable that a term reads, if the branch may tell the optimiser about it; else null. A
+/// variable that nothing assigns, a param above all, would pay with its constant: the assignments
+/// on the branches would give it a phi function at the loop around main.
+ZfCCfgVariable* offeredVariable(const Term* pTerm) {
+    if (pTerm->Op != Operator::Variable)
+        return nullptr;
+    ZfCCfgSFVariable* pOriginal = hpn::originalOf(pTerm->pVariable);
+    if (pOriginal->isVolatile() || pOriginal->isArray() || !pOriginal->isAssigned())
+        return nullptr;
+    return pTerm->pVariable;
+}
+
+/// Whether equality with the number means that the variable holds this number, bit for bit. Both
+/// zeros equal zero, and a NaN equals nothing. A Boolean is offered whatever the number is: out of
+/// its range the comparison itself is constant.
+bool isTellingConstant(ZfCCfgVariable* pVariable, double Number) {
+    const hpn::Type& Of = hpn::originalOf(pVariable)->getType();
+    if (Of.Base == hpn::BaseType::Bool)
+        return true;
+    if (hpn::isFloating(Of.Base) && Number == 0.0)
+        return false;
+    return hpn::convertNumber(Number, Of) == Number;
+}
+
+} // namespace
+
+ZfCCfgSFExpression::ZfCCfgSFExpression(Term* pRoot) : m_pRoot(pRoot) {
+}
+
+ZfCCfgSFExpression::~ZfCCfgSFExpression() = default;
+
+leda::set<ZfCCfgVariable*, leda::avl_tree> ZfCCfgSFExpression::getUsedVariables() {
+    leda::set<ZfCCfgVariable*, leda::avl_tree> Variables;
+    collectVariables(m_pRoot, Variables);
+    return Variables;
+}
+
+void ZfCCfgSFExpression::replaceVariable(ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
+    replaceRead(m_pRoot, pOld, pNew);
+}
+
+void ZfCCfgSFExpression::replaceConditionWithConstant(double Number) {
+    becomeNumber(m_pRoot, Number);
+}
+
+ZfCCfgValue ZfCCfgSFExpression::evaluate() {
+    if (isMarkedAsEvalToNonConst())
+        return ZfCCfgValue(eCfgValueNonConstant);
+    return hpn::valueOfTerm(m_pRoot);
+}
+
+ZfCCfgValue ZfCCfgSFExpression::getMinimum() {
+    return getEnd(false);
+}
+
+ZfCCfgValue ZfCCfgSFExpression::getMaximum() {
+    return getEnd(true);
+}
+
+ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
+    if (isMarkedAsEvalToNonConst() || m_pRoot->Op == Operator::Element)
+        return ZfCCfgValue(eCfgValueNonConstant);
+    const ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
+    if (Value.isConstant())
+        return std::isnan(Value.getValue()) ? ZfCCfgValue(eCfgValueNonConstant) : Value;
+    const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
+    if (Value.isUndetermined() && !Range.isSingle())
+        return Value;
+    if (Range.MayBeNaN || Range.isEmpty())
+        return ZfCCfgValue(eCfgValueNonConstant);
+    return ZfCCfgValue(IsMaximum ? Range.High : Range.Low);
+}
+
+void ZfCCfgSFExpression::replaceConstantVariables() {
+    replaceConstantReads(m_pRoot);
+}
+
+void ZfCCfgSFExpression::replaceConstantCondition() {
+    // The reads of inputs stay; the emitter makes them where only one way is left.
+    if (hasSideEffects())
+        return;
+    ZfCCfgValue Value = evaluate();
+    if (Value.isConstant())
+        becomeNumber(m_pRoot, Value.getValue());
+}
+
+void ZfCCfgSFExpression::foldConstants() {
+    hpn::foldTerm(m_pRoot);
+}
+
+ZfCCfgVariable* ZfCCfgSFExpression::isVariable(bool& Negated) {
+    return offeredVariable(stripNegations(m_pRoot, Negated));
+}
+
+bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, ZfCCfgValue& Value,
+                                                   bool& Negated) {
+    const Term* pTerm = stripNegations(m_pRoot, Negated);
+    if (pTerm->Op != Operator::Equal && pTerm->Op != Operator::NotEqual)
+        return false;
+    const Term* pLeft = stripCasts(pTerm->pLeft);
+    const Term* pRight = stripCasts(pTerm->pRight);
+    if (pLeft->Op == Operator::Number)
+        std::swap(pLeft, pRight);
+    ZfCCfgVariable* pRead = offeredVariable(pLeft);
+    if (pRead == nullptr || pRight->Op != Operator::Number ||
+        !isTellingConstant(pRead, pRight->Number))
+        return false;
+    pVariable = pRead;
+    Value = ZfCCfgValue(pRight->Number);
+    Negated = Negated != (pTerm->Op == Operator::NotEqual);
+    return true;
+}
+
+bool ZfCCfgSFExpression::hasSideEffects() {
+    return hpn::readsInput(m_pRoot);
+}
+
+ZfCCfgSFExpression* ZfCCfgSFExpression::isSFExpression() {
+    return this;
+}
+
+void ZfCCfgSFExpression::actOnComparisonOutsideBoolRange() {
+    hpn::pendingWarnings().push_back(
+        {m_pRoot->Position, "a Boolean variable is compared with a number other than 0 and 1"});
+}

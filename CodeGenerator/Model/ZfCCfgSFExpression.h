@@ -1,0 +1,46 @@
+#ifndef ZFCCFGSFEXPRESSION_H
+#define ZFCCFGSFEXPRESSION_H
+
+#include "Model/Term.h"
+#include "ZfCCfgExpression.h"
+
+/// The client's expression: a right-hand side, a branch condition or a call argument. It is a thin
+/// owner-less shell over a tree of `hpn::Term`s, which the term arena of the program graph owns;
+/// the shell itself belongs to the factory from `addSFExpression` on, which its maker calls. A
+/// right-hand side's and an argument's root converts to the type it is stored in (value and range),
+/// so that the setters of the variable find nothing left to clip, round or wrap.
+///
+/// A minimum and a maximum are given only together, and only if the number cannot be a NaN: an end
+/// that is a NaN would get lost where ranges meet.
+class ZfCCfgSFExpression : public ZfCCfgExpression {
+public:
+    explicit ZfCCfgSFExpression(hpn::Term* pRoot);
+
+    hpn::Term* getRoot() const { return m_pRoot; }
+
+    leda::set<ZfCCfgVariable*, leda::avl_tree> getUsedVariables() override;
+    void replaceVariable(ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) override;
+    void replaceConditionWithConstant(double Number) override;
+    ZfCCfgValue evaluate() override;
+    ZfCCfgValue getMinimum() override;
+    ZfCCfgValue getMaximum() override;
+    void replaceConstantVariables() override;
+    void replaceConstantCondition() override;
+    void foldConstants() override;
+    ZfCCfgVariable* isVariable(bool& Negated) override;
+    bool isVariableEqualToConstant(ZfCCfgVariable*& pVariable, ZfCCfgValue& Value,
+                                   bool& Negated) override;
+    bool hasSideEffects() override;
+    ZfCCfgSFExpression* isSFExpression() override;
+    void actOnComparisonOutsideBoolRange() override;
+
+protected:
+    ~ZfCCfgSFExpression() override;
+
+private:
+    ZfCCfgValue getEnd(bool IsMaximum);
+
+    hpn::Term* m_pRoot;
+};
+
+#endif

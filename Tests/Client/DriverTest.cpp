@@ -1,0 +1,244 @@
+#include "DriverTestSupport.h"
+
+#include <gtest/gtest.h>
+
+#include <sstream>
+#include <vector>
+
+namespace {
+
+const char* const Small = "input uint8 key;\n"
+                          "output uint8 lamp = 0;\n"
+                          "state uint8 count = 0;\n"
+                          "param bool LOUD = false;\n"
+                          "proc main() {\n"
+                          "  if (LOUD) { lamp = 9; } else { lamp = 3; }\n"
+                          "  if (key == 1) { count = count + 1; }\n"
+                          "}\n";
+
+// The program that every user meets first.
+const char* const Cruise = R"(// Cruise control: one pass of main is one step of the controller.
+type Speed   = uint16 lsb 0.01 offset 0 range [0, 300] saturate;   // km/h
+type Percent = uint8  lsb 0.5           range [0, 100] saturate;
+
+input  Speed   vehicle_speed;              // changes outside at any time: volatile
+input  bool    brake;
+input  uint8   button;                     // 0 none, 1 set, 2 resume, 3 off
+output Percent throttle   = 0;
+state  Speed   target     = 0;
+state  float64 integral   = 0.0;
+state  bool    active     = false;
+state  uint8   history[8];                 // an array: its elements are not tracked
+param  bool    HAS_RESUME = false;         // option of this vehicle line; never assigned
+param  float64 KP = 0.8;
+param  float64 KI = 0.05;
+
+extern log_event reads(target, active) writes(history);
+
+proc main() {
+  if (brake || button == 3)                { active = false; log_event(); }
+  else if (button == 1)                    { target = vehicle_speed; active = true; }
+  else if (HAS_RESUME && button == 2)      { active = true; }
+  if (active) { regulate(target - vehicle_speed); }
+  else        { throttle = 0; integral = 0.0; }
+}
+
+proc regulate(float64 error) {
+  local uint8 i = 0;
+  integral = integral + KI * error;
+  while (i < 8) { history[i] = history[i] / 2; i = i + 1; }
+  if (integral > 50.0) { integral = 50.0; } else if (integral < -50.0) { integral = -50.0; }
+  throttle = max(0.0, KP * error + integral);
+}
+)";
+
+bool contains(const std::string& Text, const std::string& Part) {
+    return Text.find(Part) != std::string::npos;
+}
+
+TEST(Driver, ExitStatusTellsTheKindOfFailure) {
+    struct Case {
+        const char* Arguments;
+        int Status;
+        const char* Message; ///< beginning of the error output
+    };
+    const Case Cases[] = {
+        {"small.hpn -o out.c", 0, ""},
+        {"--help", 0, ""},
+        {"--version", 0, ""},
+        {"small.hpn --print", 0, ""},
+        {"bad.hpn -o out.c", 1, "bad.hpn:1:"},
+        {"small.hpn bad.hpn", 1, "bad.hpn:1:"},
+        {"", 2, "hpncg: error: FILES"},
+        {"absent.hpn", 2, "hpncg: error: cannot read 'absent.hpn': "},
+        {"small.hpn --nonsense", 2, "hpncg: error: "},
+        {"small.hpn --stats=xml", 2, "hpncg: error: --stats: 'xml' is neither"},
+        {"small.hpn --passes=foldConstants", 2, "hpncg: error: --passes: foldConstants needs prop"},
+        {"small.hpn --no-optimize --ranges", 2, "hpncg: error: --ranges: without propagate"},
+        {"small.hpn -o small.hpn", 2, "hpncg: error: the output 'small.hpn' is one of the program"},
+        {"small.hpn -o absent/out.c", 2, "hpncg: error: cannot write "},
+        {"small.hpn --dump-dot=small.hpn/x", 2, "hpncg: error: cannot make the directory"},
+        {"- - </dev/null", 2, "hpncg: error: standard input can be read only once"},
+        {"small.hpn -o /dev/full", 2, "hpncg: error: cannot write '/dev/full': "},
+    };
+    for (const Case& Each : Cases) {
+        DriverRun Run;
+        Run.write("small.hpn", Small);
+        Run.write("bad.hpn", "proc main( {\n");
+        EXPECT_EQ(Run.run(Each.Arguments), Each.Status) << Each.Arguments << "\n" << Run.errors();
+        EXPECT_EQ(Run.errors().rfind(Each.Message, 0), 0u) << Each.Arguments << Run.errors();
+        if (*Each.Message == '\0') {
+            EXPECT_EQ(Run.errors(), "") << Each.Arguments;
+        }
+    }
+}
+
+TEST(Driver, FailedRunLeavesEveryFileAsItWas) {
+    const char* const Failing[] = {"bad.hpn -o out.c", "small.hpn -o out.c --passes=foldConstants",
+                                   "small.hpn bad.hpn -o out.c --stats",
+                                   "small.hpn -o out.c --dump-dot=out.c/sub"};
+    for (const char* Arguments : Failing) {
+        DriverRun Run;
+        Run.write("small.hpn", Small);
+        Run.write("bad.hpn", std::string(Small) + "proc broken() { lamp = ; }\n");
+        Run.write("out.c", "kept");
+        Run.write("stdout", "");
+        Run.write("stderr", "");
+        const auto Before = Run.files();
+        EXPECT_NE(Run.run(Arguments), 0) << Arguments;
+        auto After = Run.files();
+        After["stdout"] = After["stderr"] = "";
+        EXPECT_EQ(After, Before) << Arguments;
+    }
+}
+
+TEST(Driver, ReplacesTheOutputWholeAndLeavesNothingElseBehind) {
+    DriverRun Run;
+    Run.write("small.hpn", Small);
+    Run.write("real.c", "old");
+    std::filesystem::create_symlink("real.c", Run.directory() + "/link.c");
+    ASSERT_EQ(Run.run("small.hpn -o link.c"), 0) << Run.errors();
+    EXPECT_TRUE(contains(Run.read("real.c"), "small_step"));
+    EXPECT_TRUE(std::filesystem::is_symlink(Run.directory() + "/link.c"));
+    for (const auto& [Name, Text] : Run.files())
+        EXPECT_FALSE(contains(Name, ".tmp")) << Name;
+}
+
+TEST(Driver, StandardInputAndOutputCarryTheSameProgramAsFiles) {
+    DriverRun Run;
+    Run.write("small.hpn", Small);
+    ASSERT_EQ(Run.run("--print small.hpn"), 0) << Run.errors();
+    const std::string Printed = Run.output();
+    ASSERT_EQ(Run.run("--print - <small.hpn"), 0) << Run.errors();
+    EXPECT_EQ(Run.output(), Printed);
+    Run.write("printed.hpn", Printed);
+    ASSERT_EQ(Run.run("--print printed.hpn"), 0) << Run.errors();
+    EXPECT_EQ(Run.output(), Printed);
+
+    // Without a file the code needs nothing beside it: it compiles alone, in an empty directory.
+    ASSERT_EQ(Run.run("small.hpn"), 0) << Run.errors();
+    std::filesystem::create_directory(Run.directory() + "/alone");
+    Run.write("alone/small.c", Run.output());
+    const std::string Compile = "cd " + Run.directory() +
+                                "/alone && gcc -std=c99 -Wall -Wextra "
+                                "-Werror -O2 -c small.c";
+    EXPECT_EQ(std::system(Compile.c_str()), 0);
+}
+
+TEST(Driver, ReportsGoBesideTheCodeAndNotIntoIt) {
+    DriverRun Run;
+    Run.write("small.hpn", Small);
+    ASSERT_EQ(Run.run("small.hpn"), 0);
+    const std::string Code = Run.output();
+    ASSERT_EQ(Run.run("small.hpn --stats --ranges --time-passes"), 0);
+    EXPECT_EQ(Run.output(), Code);
+    EXPECT_TRUE(contains(Run.errors(), "constants found"));
+    ASSERT_EQ(Run.run("small.hpn --stats=json -o out.c"), 0);
+    EXPECT_EQ(Run.errors(), "");
+    EXPECT_EQ(Run.output().rfind("{\n  \"program\": \"small\",\n  \"before\": {", 0), 0u);
+}
+
+// Addresses differ from run to run by themselves; another environment, a fixed layout and another
+// allocator's settings shift them further.
+TEST(Driver, RunsUnderDifferentAddressesGiveIdenticalBytes) {
+    std::vector<const char*> Surroundings = {
+        "", "env PADDING=$(head -c 40000 /dev/zero | tr '\\0' x)",
+        "env MALLOC_ARENA_MAX=1 MALLOC_MMAP_THRESHOLD_=64 MALLOC_PERTURB_=85"};
+    // Not allowed in every container.
+    if (std::system("setarch -R true 2>/dev/null") == 0)
+        Surroundings.push_back("setarch -R");
+    std::map<std::string, std::string> First;
+    for (const char* Before : Surroundings) {
+        DriverRun Run;
+        Run.write("cruise.hpn", Cruise);
+        std::filesystem::create_directory(Run.directory() + "/out");
+        ASSERT_EQ(Run.run("cruise.hpn -o out/cruise.c --dump-dot=out --dump-html=out "
+                          "--stats --ranges",
+                          Before),
+                  0)
+            << Run.errors();
+        auto Files = Run.files("out");
+        Files["report"] = Run.output();
+        EXPECT_EQ(Files.size(), 2u * 13u + 3u);
+        if (First.empty())
+            First = Files;
+        for (const auto& [Name, Text] : First)
+            EXPECT_EQ(Files[Name], Text) << Name << " under: " << Before;
+    }
+}
+
+TEST(Driver, DumpsAreNamedByNumberAndPassAndNameEveryVariable) {
+    DriverRun Run;
+    Run.write("small.hpn", Small);
+    ASSERT_EQ(Run.run("small.hpn -o out.c --dump-dot=d/e --dump-html=h "
+                      "--passes=placeExitNodes,placeLoopAroundMain,transformToSSAForm"),
+              0)
+        << Run.errors();
+    const auto Dots = Run.files("d/e");
+    std::vector<std::string> Names;
+    for (const auto& [Name, Text] : Dots)
+        Names.push_back(Name);
+    EXPECT_EQ(Names, (std::vector<std::string>{"00_asBuilt_SF_0.dot", "01_placeExitNodes_SF_1.dot",
+                                               "02_placeLoopAroundMain_SF_2.dot",
+                                               "03_transformToSSAForm_SF_3.dot"}));
+    EXPECT_TRUE(contains(Dots.at("00_asBuilt_SF_0.dot"), "(Var_") ||
+                contains(Dots.at("00_asBuilt_SF_0.dot"), ":key"));
+    EXPECT_EQ(Run.files("h").size(), 4u);
+    EXPECT_TRUE(contains(Run.files("h").at("03_transformToSSAForm_SF_3.html"), "SSA (Orig: Var_"));
+}
+
+TEST(Driver, CruiseControlLosesTheOptionThatThisVehicleLacks) {
+    DriverRun Run;
+    Run.write("cruise.hpn", Cruise);
+    ASSERT_EQ(Run.run("cruise.hpn -o cruise.c --ranges --stats --check"), 0) << Run.errors();
+    const std::string Code = Run.read("cruise.c");
+    EXPECT_FALSE(contains(Code, "HAS_RESUME")) << Code;
+    EXPECT_FALSE(contains(Code, "== 2")) << Code;
+    EXPECT_TRUE(contains(Code, "== 1")) << Code;
+    EXPECT_FALSE(Run.read("hpn_runtime.h").empty());
+    // One line for each variable, by name; the ranges are those of the types or better.
+    const std::string Report = Run.output();
+    for (const char* Name : {"\ntarget ", "\nintegral ", "\nregulate.i ", "\nthrottle "})
+        EXPECT_TRUE(contains(Report, Name)) << Name << Report;
+    EXPECT_TRUE(contains(Report, "not tracked: array")) << Report;
+    ASSERT_EQ(Run.run("cruise.hpn --no-optimize"), 0);
+    EXPECT_TRUE(contains(Run.output(), "HAS_RESUME"));
+}
+
+// The first two C blocks of the README, before and after, are what the tool gives for its first
+// program text.
+TEST(Driver, ReadmeShowsWhatTheToolGives) {
+    const std::string Readme = DriverRun::readFile(HPNSSA_SOURCE_DIR "/README.md");
+    const auto blockOf = [&Readme](const std::string& Opening) {
+        const std::size_t Begin = Readme.find(Opening) + Opening.size();
+        return Readme.substr(Begin, Readme.find("```", Begin) - Begin);
+    };
+    DriverRun Run;
+    Run.write("heater.hpn", blockOf("```text\n"));
+    ASSERT_EQ(Run.run("heater.hpn"), 0) << Run.errors();
+    const std::string Shown = blockOf("```c\n");
+    ASSERT_FALSE(Shown.empty());
+    EXPECT_TRUE(contains(Run.output(), Shown)) << Run.output();
+}
+
+} // namespace

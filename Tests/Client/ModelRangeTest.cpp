@@ -1,0 +1,213 @@
+// Interval arithmetic against all numbers of small domains: never too narrow, and as narrow as an
+// interval can be.
+
+#include "Model/Term.h"
+#include "Model/ValueRange.h"
+#include "ModelTestNumbers.h"
+
+#include <gtest/gtest.h>
+
+#include <limits>
+#include <random>
+#include <vector>
+
+namespace {
+
+using namespace hpn;
+using namespace hpn::test;
+
+std::vector<Operator> binaryOperators() {
+    std::vector<Operator> Operators;
+    for (int i = static_cast<int>(Operator::Multiply); i <= static_cast<int>(Operator::Maximum);
+         ++i)
+        Operators.push_back(static_cast<Operator>(i));
+    return Operators;
+}
+
+const std::vector<Operator> UnaryOperators = {Operator::Negate, Operator::LogicalNot,
+                                              Operator::Complement, Operator::Absolute,
+                                              Operator::Sign};
+
+ValueRange integers(int Low, int High) {
+    return hull(rangeOfNumber(Low), rangeOfNumber(High));
+}
+
+/// Counts how often a range equals what was seen, and fails where it lacks something.
+struct Tally {
+    int Total = 0;
+    int Exact = 0;
+
+    void add(const ValueRange& Claimed, const std::vector<double>& Seen) {
+        ValueRange Hull = rangeOfNumber(Seen.front());
+        for (const double Number : Seen) {
+            ASSERT_TRUE(Claimed.contains(Number))
+                << Number << " in " << Claimed.Low << " to " << Claimed.High;
+            Hull = hull(Hull, rangeOfNumber(Number));
+        }
+        ++Total;
+        Exact += Hull.Low == Claimed.Low && Hull.High == Claimed.High &&
+                         Hull.MayBeNaN == Claimed.MayBeNaN &&
+                         Hull.MayBeNegativeZero == Claimed.MayBeNegativeZero
+                     ? 1
+                     : 0;
+    }
+};
+
+// All pairs of intervals of a signed domain of four bits. Shift counts from it are taken modulo 32,
+// so they wrap.
+TEST(ModelRange, AllPairsOfSmallIntegerIntervalsAgainstAllTheirNumbers) {
+    for (const Operator Op : binaryOperators()) {
+        Tally Result;
+        std::vector<double> Seen;
+        for (int a = -8; a < 8; ++a) {
+            for (int b = a; b < 8; ++b) {
+                for (int c = -8; c < 8; ++c) {
+                    Seen.clear();
+                    for (int d = c; d < 8; ++d) {
+                        for (int Left = a; Left <= b; ++Left)
+                            Seen.push_back(computeBinary(Op, Left, d));
+                        Result.add(rangeOfBinary(Op, integers(a, b), integers(c, d)), Seen);
+                        if (HasFatalFailure())
+                            return;
+                    }
+                }
+            }
+        }
+        EXPECT_GE(Result.Exact * 100, Result.Total * 95)
+            << static_cast<int>(Op) << ": " << Result.Exact;
+    }
+}
+
+// Bit operators and shifts where the sign bit and the window of 32 bits matter: blocks of numbers
+// around the borders.
+TEST(ModelRange, IntegerOperatorsAtTheBordersOf32Bits) {
+    std::mt19937 Random(11);
+    const double Borders[] = {-2147483648.0, -1073741824.0, -65536.0,     0.0,
+                              65536.0,       1073741824.0,  2147483640.0, 2147483648.0};
+    for (const Operator Op : {Operator::BitAnd, Operator::BitOr, Operator::BitXor,
+                              Operator::ShiftLeft, Operator::ShiftRight, Operator::Modulo}) {
+        Tally Result;
+        for (int i = 0; i < 4000; ++i) {
+            const double a = Borders[Random() % 8] + static_cast<int>(Random() % 24) - 12;
+            const double c = (Random() % 2 != 0 ? Borders[Random() % 8] : 0.0) +
+                             static_cast<int>(Random() % 40) - 8;
+            const double b = a + Random() % 12;
+            const double d = c + Random() % 12;
+            ValueRange Left = hull(rangeOfNumber(a), rangeOfNumber(b));
+            ValueRange Right = hull(rangeOfNumber(c), rangeOfNumber(d));
+            std::vector<double> Seen;
+            for (double x = a; x <= b; ++x) {
+                for (double y = c; y <= d; ++y)
+                    Seen.push_back(computeBinary(Op, x, y));
+            }
+            Result.add(rangeOfBinary(Op, Left, Right), Seen);
+            if (HasFatalFailure())
+                return;
+        }
+        EXPECT_GE(Result.Exact * 100, Result.Total * 95)
+            << static_cast<int>(Op) << ": " << Result.Exact;
+    }
+}
+
+TEST(ModelRange, UnaryOperatorsOnSmallIntervals) {
+    for (const Operator Op : UnaryOperators) {
+        Tally Result;
+        for (int a = -8; a < 8; ++a) {
+            std::vector<double> Seen;
+            for (int b = a; b < 8; ++b) {
+                Seen.push_back(computeUnary(Op, b));
+                Result.add(rangeOfUnary(Op, integers(a, b)), Seen);
+            }
+        }
+        EXPECT_EQ(Result.Exact, Result.Total) << static_cast<int>(Op);
+    }
+}
+
+// Numbers without a neighbour: every range over them, with and without NaN and negative zero.
+const double Special[] = {-std::numeric_limits<double>::infinity(),
+                          -1e308,
+                          -2.5,
+                          -1.0,
+                          -5e-324,
+                          0.0,
+                          5e-324,
+                          0.5,
+                          1.0,
+                          3e9,
+                          1e308,
+                          std::numeric_limits<double>::infinity()};
+
+struct SpecialRange {
+    ValueRange Range;
+    std::vector<double> Numbers;
+};
+
+std::vector<SpecialRange> specialRanges() {
+    std::vector<SpecialRange> Ranges;
+    const auto add = [&Ranges](std::vector<double> Numbers, const ValueRange& Ends) {
+        ValueRange Range = Ends;
+        for (const double Number : Numbers)
+            Range = hull(Range, rangeOfNumber(Number));
+        Ranges.push_back({Range, Numbers});
+    };
+    for (std::size_t i = 0; i < 12; ++i) {
+        std::vector<double> Numbers;
+        for (std::size_t j = i; j < 12; ++j) {
+            Numbers.push_back(Special[j]);
+            const ValueRange Ends = rangeOfNumber(Special[i]);
+            add(Numbers, Ends);
+            std::vector<double> More = Numbers;
+            More.push_back(std::nan(""));
+            add(More, Ends);
+            if (i <= 5 && j >= 5) {
+                More.push_back(-0.0);
+                add(More, Ends);
+            }
+        }
+    }
+    Ranges.push_back({rangeOfNumber(std::nan("")), {std::nan("")}});
+    return Ranges;
+}
+
+TEST(ModelRange, SpecialNumbersAreNeverLost) {
+    const std::vector<SpecialRange> Ranges = specialRanges();
+    for (const Operator Op : binaryOperators()) {
+        for (const SpecialRange& Left : Ranges) {
+            for (const SpecialRange& Right : Ranges) {
+                const ValueRange Claimed = rangeOfBinary(Op, Left.Range, Right.Range);
+                for (const double a : Left.Numbers) {
+                    for (const double b : Right.Numbers)
+                        ASSERT_TRUE(Claimed.contains(computeBinary(Op, a, b)))
+                            << static_cast<int>(Op) << ": " << a << ", " << b << " in "
+                            << Claimed.Low << " to " << Claimed.High;
+                }
+            }
+        }
+    }
+    for (const Operator Op : UnaryOperators) {
+        for (const SpecialRange& Next : Ranges) {
+            for (const double Number : Next.Numbers)
+                ASSERT_TRUE(rangeOfUnary(Op, Next.Range).contains(computeUnary(Op, Number)))
+                    << Number;
+        }
+    }
+}
+
+// A greater operand never gives a smaller result: otherwise propagation could narrow a range that
+// had to grow.
+TEST(ModelRange, ResultsGrowWithTheirOperands) {
+    const std::vector<SpecialRange> Ranges = specialRanges();
+    std::mt19937 Random(3);
+    const auto pick = [&]() -> const ValueRange& { return Ranges[Random() % Ranges.size()].Range; };
+    for (const Operator Op : binaryOperators()) {
+        for (int i = 0; i < 4000; ++i) {
+            const ValueRange Left = pick();
+            const ValueRange Right = pick();
+            const ValueRange Narrow = rangeOfBinary(Op, Left, Right);
+            ASSERT_TRUE(Narrow.isWithin(rangeOfBinary(Op, hull(Left, pick()), hull(Right, pick()))))
+                << static_cast<int>(Op);
+        }
+    }
+}
+
+} // namespace
