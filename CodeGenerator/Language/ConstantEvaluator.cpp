@@ -49,8 +49,8 @@ std::string describeLoss(double Number, const Type& To) {
     if (std::fabs(Stored - Number) <= roundingError(Number, To)) {
         return {};
     }
-    return "initial value " + numberText(Number) + " becomes " + numberText(Stored) +
-           " in type '" + std::string(To.Name) + "'";
+    return "initial value " + numberText(Number) + " becomes " + numberText(Stored) + " in type '" +
+           std::string(To.Name) + "'";
 }
 
 } // namespace hpn

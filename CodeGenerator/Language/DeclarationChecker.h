@@ -8,8 +8,9 @@
 
 namespace hpn {
 
-/// Completes the declarations when all files' are known: numbers of elements, initial values (in the order of the sources, since
-/// params stand for theirs in those that follow), access lists of externs, rules of `main`.
+/// Completes the declarations when all files' are known: numbers of elements, initial values (in
+/// the order of the sources, since params stand for theirs in those that follow), access lists of
+/// externs, rules of `main`.
 class DeclarationChecker {
 public:
     static constexpr double GreatestCount = 65536.0;      ///< elements of one array
@@ -29,7 +30,8 @@ private:
 
     ReaderState& m_State;
     std::size_t m_Elements = 0; ///< of all arrays so far
-    /// By Variable::Index: the access list that has named it last. A list is completed before the next begins.
+    /// By Variable::Index: the access list that has named it last. A list is completed before the
+    /// next begins.
     std::vector<const std::vector<Variable*>*> m_LastList;
 };
 

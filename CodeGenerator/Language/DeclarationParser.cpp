@@ -38,17 +38,22 @@ void DeclarationParser::parseDeclaration() {
     case TokenKind::Proc:
         return parseProcedure();
     default:
-        m_Cursor.expected("a declaration");
-        // The rest up to the next declaration most likely belongs to one mistake, whatever its semicolons.
-        while (!m_Cursor.is(TokenKind::End) && !isDeclarator(m_Cursor.kind())) {
-            m_Cursor.recoverDeclaration();
-        }
-        return;
+        return passStray();
     }
     if (!IsRead) {
         m_Cursor.recoverDeclaration();
         m_Cursor.markSuspect(Begin);
     } else if (!m_Cursor.expectSemicolon() && !isDeclarator(m_Cursor.kind())) {
+        m_Cursor.recoverDeclaration();
+    }
+}
+
+void DeclarationParser::passStray() {
+    if (!std::exchange(m_IsBodyCut, false)) {
+        m_Cursor.expected("a declaration");
+    }
+    // All up to the next declaration most likely belongs to one mistake, whatever its semicolons.
+    while (!m_Cursor.is(TokenKind::End) && !isDeclarator(m_Cursor.kind())) {
         m_Cursor.recoverDeclaration();
     }
 }
@@ -168,13 +173,15 @@ bool DeclarationParser::parseVariable(VariableKind Kind) {
     Pending.pVariable = m_State.makeVariable(Kind, Entry.Text, Position);
     Pending.pVariable->pType = pType;
     const bool IsFree = m_State.isFree(Entry, Position);
+    const std::size_t ErrorsBefore = m_State.Messages.getErrorCount();
     const bool IsRead = parseCount(Pending) && parseInitializer(Pending);
     // Entered behind its own initialiser, which must not use it.
     if (IsFree) {
         Entry.Kind = SymbolKind::Variable;
         Entry.pVariable = Pending.pVariable;
     }
-    if (IsRead) {
+    // Numbers with a mistake in them would only be a second mistake.
+    if (IsRead && m_State.Messages.getErrorCount() == ErrorsBefore) {
         m_State.Variables.push_back(Pending);
     }
     return IsRead;
@@ -297,8 +304,16 @@ void DeclarationParser::parseProcedure() {
     }
 }
 
+/// The current token is the procedure's name and not its result type. A name that is no type, with
+/// no name behind it, lacks its parentheses.
+bool DeclarationParser::startsName() const {
+    return m_Cursor.is(TokenKind::Identifier) && (m_Cursor.nextKind() == TokenKind::ParenOpen ||
+                                                  (m_Cursor.name().Kind != SymbolKind::Type &&
+                                                   m_Cursor.nextKind() != TokenKind::Identifier));
+}
+
 bool DeclarationParser::parseProcedureHeader(Procedure& Declared) {
-    if (!m_Cursor.is(TokenKind::Identifier) || m_Cursor.nextKind() != TokenKind::ParenOpen) {
+    if (!startsName()) {
         const Type* pType = expectType();
         if (pType == nullptr) {
             return false;
@@ -339,8 +354,8 @@ bool DeclarationParser::parseFormals(Procedure& Declared) {
             m_Cursor.expected("the formal's name");
             return false;
         }
-        Variable* pFormal = m_State.makeVariable(VariableKind::Formal, m_Cursor.name().Text,
-                                                 m_Cursor.position());
+        Variable* pFormal =
+            m_State.makeVariable(VariableKind::Formal, m_Cursor.name().Text, m_Cursor.position());
         pFormal->pType = pType;
         pFormal->pOwner = &Declared;
         Declared.Formals.push_back(pFormal);
@@ -353,8 +368,8 @@ bool DeclarationParser::parseFormals(Procedure& Declared) {
     return m_Cursor.expect(TokenKind::ParenClose, "')'");
 }
 
-/// To behind the brace that closes the body. A declaration's first word ends it too: then the brace is missing, which is
-/// reported when the body is read.
+/// To behind the brace that closes the body. A declaration's first word ends it too: then the brace
+/// is missing, which is reported when the body is read.
 void DeclarationParser::passBody() {
     std::size_t Depth = 0;
     do {
@@ -365,6 +380,7 @@ void DeclarationParser::passBody() {
         }
         m_Cursor.advance();
     } while (Depth > 0 && !m_Cursor.is(TokenKind::End) && !isDeclarator(m_Cursor.kind()));
+    m_IsBodyCut = Depth > 0;
 }
 
 } // namespace hpn

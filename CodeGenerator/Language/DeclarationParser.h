@@ -9,9 +9,10 @@
 
 namespace hpn {
 
-/// Reads the declarations of one file and enters their names; passes over the bodies of procedures, which can be read only when all
-/// files' declarations are known. What a declaration needs from others (numbers of elements, initial values, access lists)
-/// is left to the `DeclarationChecker`. The names of all types have been entered before.
+/// Reads the declarations of one file and enters their names; passes over the bodies of procedures,
+/// which can be read only when all files' declarations are known. What a declaration needs from
+/// others (numbers of elements, initial values, access lists) is left to the `DeclarationChecker`.
+/// The names of all types have been entered before.
 class DeclarationParser {
 public:
     DeclarationParser(ReaderState& State, std::uint32_t File, TokenCursor& Cursor)
@@ -36,10 +37,13 @@ private:
     bool parseAccesses(Extern& Declared, bool IsWrite);
 
     void parseProcedure();
+    bool startsName() const;
     bool parseProcedureHeader(Procedure& Declared);
     bool parseFormals(Procedure& Declared);
     void passBody();
 
+    /// Something that begins no declaration: one message, and on to the next declaration.
+    void passStray();
     /// A type's name, or a message.
     const Type* expectType();
 
@@ -47,6 +51,9 @@ private:
     std::uint32_t m_File;
     TokenCursor& m_Cursor;
     ExpressionParser m_Expressions;
+    /// A declaration cut the last body short: what is left of that body belongs to the same
+    /// mistake, which is reported when the body is read.
+    bool m_IsBodyCut = false;
 };
 
 } // namespace hpn

@@ -11,7 +11,8 @@ namespace {
 constexpr std::size_t LongestLine = 160; ///< characters of a source line that a message shows
 constexpr std::size_t ShownBefore = 100; ///< of a longer line: as many before the place
 
-/// The characters of a line; what a terminal cannot show is replaced, so that the caret stays below its place.
+/// The characters of a line; what a terminal cannot show is replaced, so that the caret stays below
+/// its place.
 std::vector<std::string_view> splitCharacters(std::string_view Line) {
     std::vector<std::string_view> Characters;
     while (!Line.empty()) {
@@ -69,8 +70,7 @@ void Diagnostics::warning(SourcePosition Position, std::string Text) {
 }
 
 std::string Diagnostics::describe(SourcePosition Position) const {
-    return m_Sources.getName(Position.File) + ':' +
-           std::to_string(m_Sources.locate(Position).Line);
+    return m_Sources.getName(Position.File) + ':' + std::to_string(m_Sources.locate(Position).Line);
 }
 
 void Diagnostics::printOne(const Diagnostic& Message, std::string& Out) const {
@@ -91,11 +91,11 @@ std::string Diagnostics::print() const {
     for (const Diagnostic& Message : m_Messages) {
         Ordered.push_back(&Message);
     }
-    std::stable_sort(
-        Ordered.begin(), Ordered.end(), [](const Diagnostic* pLeft, const Diagnostic* pRight) {
-            return std::make_pair(pLeft->Position.File, pLeft->Position.Offset) <
-                   std::make_pair(pRight->Position.File, pRight->Position.Offset);
-        });
+    std::stable_sort(Ordered.begin(), Ordered.end(),
+                     [](const Diagnostic* pLeft, const Diagnostic* pRight) {
+                         return std::make_pair(pLeft->Position.File, pLeft->Position.Offset) <
+                                std::make_pair(pRight->Position.File, pRight->Position.Offset);
+                     });
     std::string Out;
     for (const Diagnostic* pMessage : Ordered) {
         printOne(*pMessage, Out);

@@ -17,9 +17,10 @@ struct Diagnostic {
     std::string Text;
 };
 
-/// Collects what is wrong with a program. Takes up to 20 errors: after these `isFull` holds, further ones are dropped and the
-/// reader stops, since whoever has 20 mistakes mends some of them first. Warnings are counted all and kept up to the same
-/// number. Printed in the order of the sources, whichever step of the reader has found them.
+/// Collects what is wrong with a program. Takes up to 20 errors: after these `isFull` holds,
+/// further ones are dropped and the reader stops, since whoever has 20 mistakes mends some of them
+/// first. Warnings are counted all and kept up to the same number. Printed in the order of the
+/// sources, whichever step of the reader has found them.
 class Diagnostics {
 public:
     static constexpr std::size_t Limit = 20;
@@ -39,7 +40,8 @@ public:
     const std::vector<Diagnostic>& getMessages() const { return m_Messages; }
     /// "file:line" of a place, for messages that point to a second one.
     std::string describe(SourcePosition Position) const;
-    /// All messages as text: `file:line:column: error: text`, the source line, a caret below the place.
+    /// All messages as text: `file:line:column: error: text`, the source line, a caret below the
+    /// place.
     std::string print() const;
 
 private:

@@ -105,12 +105,19 @@ void ExpressionParser::reportUndeclared(NameEntry& Entry, SourcePosition Positio
     }
 }
 
-/// The operand to the left has been read; takes all operators that bind at least as strongly as the lowest wanted. Chains of
-/// operators of one precedence are a loop; only a stronger one to the right nests.
+/// The operand to the left has been read; takes all operators that bind at least as strongly as the
+/// lowest wanted. Chains of operators of one precedence are a loop; only a stronger one to the
+/// right nests.
 ParsedExpression ExpressionParser::parseBinary(ParsedExpression Left, int LowestPrecedence) {
-    if (m_Nesting++ > GreatestNesting) {
+    // Behind a mistake there is nothing to count: it would be reported at every level on the way
+    // back.
+    if (!Left) {
+        return Left;
+    }
+    if (m_Nesting > GreatestNesting) {
         return tooDeep(m_Cursor.position());
     }
+    ++m_Nesting;
     for (;;) {
         const BinaryOperator& Found = binaryOperator(m_Cursor.kind());
         if (!Left || Found.Precedence < LowestPrecedence || Found.Precedence == 0) {
@@ -145,9 +152,10 @@ ParsedExpression ExpressionParser::parseUnary() {
     default:
         break;
     }
-    if (m_Nesting++ > GreatestNesting) {
+    if (m_Nesting > GreatestNesting) {
         return tooDeep(m_Cursor.position());
     }
+    ++m_Nesting;
     const ParsedExpression Result = parseNested();
     --m_Nesting;
     return Result;
@@ -203,8 +211,8 @@ ParsedExpression ExpressionParser::parseCast(SourcePosition Position) {
     const SourcePosition TypePosition = m_Cursor.position();
     const Type* pType = acceptType();
     if (m_Use == NameUse::None && !pType->IsBuiltIn) {
-        m_Cursor.error(TypePosition, quotedName(pType->Name) +
-                                         " cannot stand in the declaration of a type");
+        m_Cursor.error(TypePosition,
+                       quotedName(pType->Name) + " cannot stand in the declaration of a type");
         return {};
     }
     if (!m_Cursor.expect(TokenKind::ParenClose, "')'")) {
@@ -277,9 +285,10 @@ ParsedExpression ExpressionParser::parseName() {
 }
 
 ParsedExpression ExpressionParser::parseElement(Variable* pVariable, SourcePosition Position) {
-    if (m_Nesting++ > GreatestNesting) {
+    if (m_Nesting > GreatestNesting) {
         return tooDeep(Position);
     }
+    ++m_Nesting;
     m_Cursor.advance();
     const ParsedExpression Index = parseBinary(parseUnary(), 1);
     --m_Nesting;
@@ -339,7 +348,8 @@ Variable* ExpressionParser::resolveConstant(NameEntry& Entry, SourcePosition Pos
     if (m_Use == NameUse::Params && IsParam) {
         return Entry.pVariable;
     }
-    if (!Entry.IsSuspect) {
+    const bool IsDeclared = Entry.Kind != SymbolKind::None || Entry.pLocal != nullptr;
+    if (IsDeclared || !Entry.IsSuspect) {
         m_Cursor.error(Position, quotedName(Entry.Text) +
                                      (m_Use == NameUse::Params
                                           ? " is no constant: it is not a param declared before"

@@ -25,8 +25,9 @@ enum class NameUse : std::uint8_t {
     None    ///< a constant of a type: no names at all, casts to built-in types only
 };
 
-/// Reads expressions by precedence climbing and resolves their names at once. No tree it gives is higher than `GreatestHeight`, so
-/// that whoever comes later may walk over it recursively; neither do its own calls nest deeper than `GreatestNesting`.
+/// Reads expressions by precedence climbing and resolves their names at once. No tree it gives is
+/// higher than `GreatestHeight`, so that whoever comes later may walk over it recursively; neither
+/// do its own calls nest deeper than `GreatestNesting`.
 class ExpressionParser {
 public:
     static constexpr std::uint32_t GreatestHeight = 1000;

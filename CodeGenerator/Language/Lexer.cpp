@@ -106,7 +106,8 @@ std::string quoted(std::string_view Text) {
 
 Lexer::Lexer(const SourceFiles& Sources, std::uint32_t File, NameTable& Names,
              Diagnostics& Messages)
-    : m_Text(Sources.getText(File)), m_File(File), m_Names(Names), m_Messages(Messages) {}
+    : m_Text(Sources.getText(File)), m_File(File), m_Names(Names), m_Messages(Messages) {
+}
 
 TokenList Lexer::run() {
     constexpr std::size_t GreatestSize = std::numeric_limits<std::uint32_t>::max() / 2;
@@ -114,7 +115,8 @@ TokenList Lexer::run() {
         error(0, "the file is too large: 2 GiB are the limit");
         m_Text = {};
     }
-    // A token for three characters is about what programs have; room that stays unused is never touched.
+    // A token for three characters is about what programs have; room that stays unused is never
+    // touched.
     m_List.Tokens.reserve(m_Text.size() / 3 + 2);
     skipByteOrderMark();
     for (skipBlanks(); m_At < m_Text.size() && !m_Messages.isFull(); skipBlanks()) {
@@ -199,7 +201,8 @@ void Lexer::lexName() {
     append(Kind, Start, Name);
 }
 
-/// Takes all that could be meant as one number, as C does, so that "12ab" is one mistake and not a number and a name.
+/// Takes all that could be meant as one number, as C does, so that "12ab" is one mistake and not a
+/// number and a name.
 void Lexer::lexNumber() {
     const std::size_t Start = m_At;
     const bool IsHex = m_Text[Start] == '0' && (peek(1) | 0x20) == 'x';
@@ -249,7 +252,8 @@ bool Lexer::readInteger(std::string_view Text, int Radix, double& Number) {
         return false;
     }
     Number = static_cast<double>(Value);
-    // Below 2^53 every integer is a double; above, the conversion back tells. 2^64 itself must not be converted back.
+    // Below 2^53 every integer is a double; above, the conversion back tells. 2^64 itself must not
+    // be converted back.
     constexpr double TooLarge = 18446744073709551616.0;
     if (Result.ec != std::errc() || Number >= TooLarge ||
         static_cast<std::uint64_t>(Number) != Value) {

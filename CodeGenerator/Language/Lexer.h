@@ -12,8 +12,9 @@
 
 namespace hpn {
 
-/// Cuts one file into tokens, in one pass over its bytes. Whatever the bytes are, it comes to the end: what is no part of the
-/// language becomes a Bad token and one message, and the parser keeps quiet about it. Comments may hold any bytes.
+/// Cuts one file into tokens, in one pass over its bytes. Whatever the bytes are, it comes to the
+/// end: what is no part of the language becomes a Bad token and one message, and the parser keeps
+/// quiet about it. Comments may hold any bytes.
 class Lexer {
 public:
     Lexer(const SourceFiles& Sources, std::uint32_t File, NameTable& Names, Diagnostics& Messages);

@@ -10,11 +10,10 @@ constexpr std::size_t FirstSlotCount = 1024;
 
 /// In the order of TokenKind, from Type to Float64.
 constexpr std::string_view Keywords[] = {
-    "type",  "input",  "output", "state",  "param",   "extern",  "export",   "proc",
-    "local", "if",     "else",   "while",  "do",      "for",     "switch",   "case",
-    "default", "break", "continue", "return", "goto", "true",    "false",    "min",
-    "max",   "abs",    "sgn",    "bool",   "int8",    "uint8",   "int16",    "uint16",
-    "int32", "uint32", "float32", "float64"};
+    "type",     "input",  "output", "state", "param",  "extern", "export", "proc",    "local",
+    "if",       "else",   "while",  "do",    "for",    "switch", "case",   "default", "break",
+    "continue", "return", "goto",   "true",  "false",  "min",    "max",    "abs",     "sgn",
+    "bool",     "int8",   "uint8",  "int16", "uint16", "int32",  "uint32", "float32", "float64"};
 static_assert(std::size(Keywords) == static_cast<std::size_t>(TokenKind::Float64) -
                                          static_cast<std::size_t>(TokenKind::Type) + 1);
 

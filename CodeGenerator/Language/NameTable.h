@@ -19,7 +19,8 @@ struct NameEntry {
     std::uint32_t Hash = 0;
     TokenKind Keyword = TokenKind::Identifier; ///< Identifier: no keyword
     SymbolKind Kind = SymbolKind::None;
-    /// A mistake around its declaration has been reported, or its lack of one: no more is said about it.
+    /// A mistake around its declaration has been reported, or its lack of one: no more is said
+    /// about it.
     bool IsSuspect = false;
     union {
         Type* pType = nullptr;
@@ -27,12 +28,14 @@ struct NameEntry {
         Procedure* pProcedure;
         Extern* pExtern;
     };
-    Variable* pLocal = nullptr;  ///< formal or local that is visible now
-    std::uint32_t LabelNumber = 0; ///< 1 more than its place in the list of the procedure's labels; 0: none
+    Variable* pLocal = nullptr; ///< formal or local that is visible now
+    std::uint32_t LabelNumber =
+        0; ///< 1 more than its place in the list of the procedure's labels; 0: none
 };
 
-/// All names of a program, each once. The lexer looks every name up once, by hashing; from then on a name is a number and what
-/// it means is found by indexing. So nothing behind the lexer hashes or compares texts. Keywords are entered first.
+/// All names of a program, each once. The lexer looks every name up once, by hashing; from then on
+/// a name is a number and what it means is found by indexing. So nothing behind the lexer hashes or
+/// compares texts. Keywords are entered first.
 class NameTable {
 public:
     NameTable();
@@ -51,7 +54,8 @@ private:
     void grow();
 
     std::vector<NameEntry> m_Entries;
-    std::vector<std::uint32_t> m_Slots; ///< open addressing; 0: free, else 1 more than the name's number
+    std::vector<std::uint32_t>
+        m_Slots; ///< open addressing; 0: free, else 1 more than the name's number
 };
 
 } // namespace hpn

@@ -2,6 +2,7 @@
 
 #include <charconv>
 #include <cmath>
+#include <string_view>
 
 namespace hpn {
 
@@ -14,7 +15,12 @@ void appendNumber(std::string& Out, double Number) {
     const std::to_chars_result Result =
         IsPlain ? std::to_chars(Buffer, Buffer + Room, static_cast<long long>(Number))
                 : std::to_chars(Buffer, Buffer + Room, Number);
-    Out.append(Buffer, Result.ptr);
+    const std::string_view Text(Buffer, static_cast<std::size_t>(Result.ptr - Buffer));
+    Out.append(Text);
+    // The shortest form of a large number can be its digits alone, which would read as an integer.
+    if (!IsPlain && Text.find_first_of(".eni") == std::string_view::npos) {
+        Out.append(".0");
+    }
 }
 
 std::string numberText(double Number) {

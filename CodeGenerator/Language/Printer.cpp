@@ -17,6 +17,8 @@ struct Notation {
 
 constexpr int UnaryPrecedence = 11;
 constexpr int PrimaryPrecedence = 12;
+/// Deeper nesting goes on at this margin, so that the text stays linear in the program.
+constexpr std::size_t DeepestIndent = 40;
 
 Notation notationOf(Operator Op) {
     switch (Op) {
@@ -126,7 +128,7 @@ private:
     void printOperation(const Expression& Root, Notation Form);
     void printList(const Expression* pFirst);
     void printNumber(const Expression& Literal);
-    void indent(std::size_t Depth) { m_Out.append(2 * Depth, ' '); }
+    void indent(std::size_t Depth) { m_Out.append(2 * std::min(Depth, DeepestIndent), ' '); }
 
     const Program& m_Source;
     std::string m_Out;

@@ -5,8 +5,10 @@
 #include "Language/Lexer.h"
 #include "Language/RecursionMarker.h"
 #include "Language/StatementParser.h"
+#include "Model/Conversion.h"
 
 #include <cctype>
+#include <iterator>
 
 namespace hpn {
 
@@ -62,6 +64,31 @@ void enterTypeNames(ReaderState& State, std::uint32_t File, const TokenList& Lis
     }
 }
 
+/// The bodies have made variables too; like all others, they hold a number of their type from the
+/// start.
+void completeLocals(Program& Target) {
+    for (Variable& Each : Target.Variables) {
+        if (Each.Initial.empty()) {
+            Each.Initial.push_back(convertNumber(0.0, *Each.pType));
+        }
+    }
+}
+
+void readBodies(ReaderState& State, std::vector<TokenCursor>& Cursors) {
+    std::vector<StatementParser> Parsers;
+    Parsers.reserve(Cursors.size());
+    for (TokenCursor& Cursor : Cursors) {
+        Parsers.emplace_back(State, Cursor);
+    }
+    for (const PendingBody& Body : State.Bodies) {
+        if (State.Messages.isFull()) {
+            return;
+        }
+        Cursors[Body.File].setPlace(Body.Place);
+        Parsers[Body.File].parseBody(*Body.pProcedure);
+    }
+}
+
 } // namespace
 
 bool readProgram(const SourceFiles& Sources, Diagnostics& Messages, Program& Target) {
@@ -83,25 +110,9 @@ bool readProgram(const SourceFiles& Sources, Diagnostics& Messages, Program& Tar
         DeclarationParser(State, File, Cursors.back()).run();
     }
     DeclarationChecker(State).run();
-    std::vector<StatementParser> Parsers;
-    Parsers.reserve(FileCount);
-    for (TokenCursor& Cursor : Cursors) {
-        Parsers.emplace_back(State, Cursor);
-    }
-    for (const PendingBody& Body : State.Bodies) {
-        if (Messages.isFull()) {
-            break;
-        }
-        Cursors[Body.File].setPlace(Body.Place);
-        Parsers[Body.File].parseBody(*Body.pProcedure);
-    }
+    readBodies(State, Cursors);
     markRecursion(Target, State.Calls);
-    // Bodies make variables too; those of locals have no initial value of their own.
-    for (Variable& Each : Target.Variables) {
-        if (Each.Initial.empty()) {
-            Each.Initial.push_back(0.0);
-        }
-    }
+    completeLocals(Target);
     return !Messages.hasErrors();
 }
 

@@ -18,7 +18,8 @@ struct CallEdge {
     std::uint32_t Callee;
 };
 
-/// A variable of the program whose number of elements and initial values wait for the types and params of all files.
+/// A variable of the program whose number of elements and initial values wait for the types and
+/// params of all files.
 struct PendingVariable {
     Variable* pVariable = nullptr;
     Expression* pCount = nullptr; ///< null: a scalar
@@ -41,7 +42,8 @@ struct PendingBody {
     std::uint32_t Place = 0; ///< of its opening brace among the file's tokens
 };
 
-/// What the steps of the reader share: the program that is being built, its names and what is still to be done.
+/// What the steps of the reader share: the program that is being built, its names and what is still
+/// to be done.
 struct ReaderState {
     const SourceFiles& Sources;
     Diagnostics& Messages;

@@ -18,9 +18,10 @@ struct LineAndColumn {
     std::size_t Column = 1;
 };
 
-/// The texts of one program, in the order of reading. Owns them: every view into a text, and so every name in a `Program`,
-/// holds as long as this object. Lines are found on demand only, since a program without mistakes never asks for one:
-/// the first question about a file costs one pass over it, later ones the logarithm of its lines.
+/// The texts of one program, in the order of reading. Owns them: every view into a text, and so
+/// every name in a `Program`, holds as long as this object. Lines are found on demand only, since a
+/// program without mistakes never asks for one: the first question about a file costs one pass over
+/// it, later ones the logarithm of its lines.
 class SourceFiles {
 public:
     SourceFiles() = default;
@@ -29,7 +30,8 @@ public:
 
     /// Takes a text over under the name that messages show; gives the file's number.
     std::uint32_t add(std::string Name, std::string Text);
-    /// Reads a file from disk. False, with the reason in `Why`, if that is not possible; then nothing is added.
+    /// Reads a file from disk. False, with the reason in `Why`, if that is not possible; then
+    /// nothing is added.
     bool addFile(const std::string& Path, std::string& Why);
     /// Reads standard input to its end, under the name "<stdin>".
     bool addStandardInput(std::string& Why);
@@ -57,7 +59,8 @@ private:
     std::deque<SourceFile> m_Files;
 };
 
-/// Length of the well-formed UTF-8 sequence at the start of a text, 0 if there is none (or the text is empty).
+/// Length of the well-formed UTF-8 sequence at the start of a text, 0 if there is none (or the text
+/// is empty).
 std::size_t utf8Length(std::string_view Text);
 
 } // namespace hpn

@@ -80,9 +80,11 @@ void StatementParser::resolveGotos() {
 
 void StatementParser::finishProcedure() {
     resolveGotos();
+    // A mistake can have hidden the goto.
+    const bool IsComplete = !m_State.Messages.hasErrors();
     for (const LabelRecord& Label : m_Labels) {
         NameEntry& Entry = m_State.Names[Label.Name];
-        if (!Label.IsUsed) {
+        if (!Label.IsUsed && IsComplete) {
             m_Cursor.warning(Label.pStatement->Position,
                              "no 'goto' reaches label " + quotedName(Entry.Text));
         }
@@ -104,6 +106,7 @@ void StatementParser::parseNext() {
         m_Frames.clear();
         return;
     }
+    m_ErrorsBefore = m_State.Messages.getErrorCount();
     switch (m_Cursor.kind()) {
     case TokenKind::BraceOpen: {
         Statement* pBlock = makeStatement(StatementKind::Block, m_Cursor.position());
@@ -136,9 +139,12 @@ void StatementParser::parseNext() {
 }
 
 void StatementParser::closeBrace() {
-    while (!m_Frames.back().IsBraced) {
+    // One message for all statements that end here without their inner one.
+    if (!m_Frames.back().IsBraced && !m_Frames.back().HasBadHead) {
         m_Cursor.expected("a statement");
-        m_Frames.pop_back();
+    }
+    while (!m_Frames.back().IsBraced) {
+        popFrame();
     }
     m_Cursor.advance();
     if (closeFrame()) {
@@ -156,13 +162,16 @@ Statement* StatementParser::makeStatement(StatementKind Kind, SourcePosition Pos
 void StatementParser::append(Statement* pStatement) {
     Frame& Innermost = m_Frames.back();
     *Innermost.ppNext = pStatement;
-    Innermost.ppNext = &pStatement->pNext;
+    for (; pStatement != nullptr; pStatement = pStatement->pNext) {
+        Innermost.ppNext = &pStatement->pNext;
+    }
 }
 
 void StatementParser::open(FrameKind Kind, Statement* pStatement, Statement** ppFirst,
                            std::size_t FirstLocal) {
     const bool IsBraced = m_Cursor.accept(TokenKind::BraceOpen);
-    m_Frames.push_back({Kind, IsBraced, false, pStatement, ppFirst, FirstLocal});
+    const bool HasBadHead = m_State.Messages.getErrorCount() != m_ErrorsBefore;
+    m_Frames.push_back({Kind, IsBraced, false, HasBadHead, pStatement, ppFirst, FirstLocal});
 }
 
 void StatementParser::complete() {
@@ -178,22 +187,30 @@ bool StatementParser::closeFrame() {
     if (Kind == FrameKind::Then && m_Cursor.is(TokenKind::Else)) {
         return continueWithElse(Innermost);
     }
-    m_Frames.pop_back();
-    if (Kind == FrameKind::While || Kind == FrameKind::For || Kind == FrameKind::Do) {
-        --m_OpenLoops;
-    } else if (Kind == FrameKind::Switch) {
-        --m_OpenSwitches;
-    }
+    popFrame();
     if (Kind == FrameKind::Do) {
         finishDo(pStatement);
     }
     return Kind != FrameKind::Body;
 }
 
+void StatementParser::popFrame() {
+    const Frame& Innermost = m_Frames.back();
+    const FrameKind Kind = Innermost.Kind;
+    closeScope(Innermost.FirstLocal);
+    if (Kind == FrameKind::While || Kind == FrameKind::For || Kind == FrameKind::Do) {
+        --m_OpenLoops;
+    } else if (Kind == FrameKind::Switch) {
+        --m_OpenSwitches;
+    }
+    m_Frames.pop_back();
+}
+
 /// `else if` takes the place of its `if` on the stack, so that a long chain stays flat.
 bool StatementParser::continueWithElse(Frame& Innermost) {
     m_Cursor.advance();
     Statement* pIf = Innermost.pStatement;
+    const std::size_t ErrorsBefore = m_State.Messages.getErrorCount();
     if (m_Cursor.is(TokenKind::If)) {
         Statement* pNested = makeStatement(StatementKind::If, m_Cursor.position());
         m_Cursor.advance();
@@ -206,6 +223,7 @@ bool StatementParser::continueWithElse(Frame& Innermost) {
         Innermost.ppNext = &pIf->pElse;
     }
     Innermost.IsBraced = m_Cursor.accept(TokenKind::BraceOpen);
+    Innermost.HasBadHead = m_State.Messages.getErrorCount() != ErrorsBefore;
     return false;
 }
 
@@ -226,8 +244,8 @@ Expression* StatementParser::parseCondition() {
         if (Condition && m_Cursor.expect(TokenKind::ParenClose, "')'")) {
             return Condition.pRoot;
         }
-        m_Cursor.recoverParenthesis();
     }
+    m_Cursor.recoverParenthesis();
     return m_State.Target.newExpression();
 }
 
@@ -262,7 +280,7 @@ void StatementParser::parseFor() {
     m_Cursor.advance();
     m_IsHead = true;
     if (!parseForHead(*pFor)) {
-        m_Cursor.recoverParenthesis();
+        m_Cursor.recoverForHead();
     }
     m_IsHead = false;
     append(pFor);
@@ -313,6 +331,8 @@ void StatementParser::parseSwitch() {
     }
     ++m_OpenSwitches;
     open(FrameKind::Switch, pSwitch, &pSwitch->pBody, m_Visible.size());
+    // The brace has been missed already, the one that closes it most likely stands there.
+    m_Frames.back().IsBraced |= m_Cursor.is(TokenKind::Case) || m_Cursor.is(TokenKind::Default);
 }
 
 StatementParser::Frame* StatementParser::innermostSwitch(const char* Label) {
@@ -385,24 +405,13 @@ void StatementParser::parseSimpleStatement() {
     Statement* pStatement = parseSimple();
     if (pStatement != nullptr) {
         append(pStatement);
-        // A declaration that takes the result of a call is one for the eye only.
-        if (pStatement->Kind == StatementKind::LocalDecl && startsCall()) {
-            NameEntry& Callee = m_Cursor.name();
-            Statement* pCall = makeStatement(StatementKind::Call, m_Cursor.position());
-            pCall->pTarget = pStatement->pTarget;
-            m_Cursor.advance();
-            pStatement = parseCall(pCall, Callee);
-            if (pStatement != nullptr) {
-                append(pStatement);
-            }
-        }
-    }
-    if (pStatement == nullptr) {
+    } else {
         if (m_Cursor.getPlace() == Begin) {
             m_Cursor.advance();
         }
         m_Cursor.recoverStatement();
-    } else if (!m_Cursor.expectSemicolon() && !m_Cursor.isFirstOnLine()) {
+    }
+    if (pStatement != nullptr && !m_Cursor.expectSemicolon() && !m_Cursor.isFirstOnLine()) {
         m_Cursor.recoverStatement();
     }
     complete();
@@ -506,21 +515,29 @@ Statement* StatementParser::parseLocal() {
     pDecl->pTarget = pLocal;
     pDecl->Name = Entry.Text;
     m_Cursor.advance();
+    const bool IsRead = parseLocalValue(*pDecl);
+    // Visible behind its own initialiser, which must not use it; also after a mistake in that.
+    declareLocal(Entry, pLocal);
+    return IsRead ? pDecl : nullptr;
+}
+
+/// The cursor stands behind the name.
+bool StatementParser::parseLocalValue(Statement& Decl) {
     if (m_Cursor.is(TokenKind::BracketOpen)) {
         m_Cursor.error(m_Cursor.position(), "a local cannot be an array");
-        declareLocal(Entry, pLocal);
-        return nullptr;
+        return false;
     }
-    if (m_Cursor.accept(TokenKind::Assign) && (m_IsHead || !startsCall())) {
-        pDecl->pValue = m_Expressions.parse().pRoot;
-        if (pDecl->pValue == nullptr) {
-            declareLocal(Entry, pLocal);
-            return nullptr;
-        }
+    if (!m_Cursor.accept(TokenKind::Assign)) {
+        return true;
     }
-    // Visible behind its own initialiser, which must not use it.
-    declareLocal(Entry, pLocal);
-    return pDecl;
+    if (!m_IsHead && startsCall()) {
+        // A call is a statement of its own, behind the declaration.
+        Decl.pNext = makeStatement(StatementKind::Call, m_Cursor.position());
+        Decl.pNext->pTarget = Decl.pTarget;
+        return parseCall(Decl.pNext) != nullptr;
+    }
+    Decl.pValue = m_Expressions.parse().pRoot;
+    return Decl.pValue != nullptr;
 }
 
 Statement* StatementParser::parseStepPrefix() {
@@ -549,11 +566,10 @@ Statement* StatementParser::parseNamed() {
         m_Cursor.expected(m_IsHead ? "an assignment" : "a statement");
         return nullptr;
     }
-    NameEntry& Entry = m_Cursor.name();
     Statement* pStatement = makeStatement(StatementKind::Assign, m_Cursor.position());
-    const bool IsCall = m_Cursor.nextKind() == TokenKind::ParenOpen;
-    m_Cursor.advance();
-    if (!IsCall) {
+    if (m_Cursor.nextKind() != TokenKind::ParenOpen) {
+        NameEntry& Entry = m_Cursor.name();
+        m_Cursor.advance();
         return parseAssignment(pStatement, Entry);
     }
     if (m_IsHead) {
@@ -561,7 +577,7 @@ Statement* StatementParser::parseNamed() {
         return nullptr;
     }
     pStatement->Kind = StatementKind::Call;
-    return parseCall(pStatement, Entry);
+    return parseCall(pStatement);
 }
 
 bool StatementParser::startsCall() const {
@@ -589,14 +605,12 @@ Statement* StatementParser::parseAssignment(Statement* pAssign, NameEntry& Entry
     }
     m_Cursor.advance();
     if (!m_IsHead && pAssign->CompoundOp == Operator::Number && startsCall()) {
-        NameEntry& Callee = m_Cursor.name();
         if (pAssign->pIndex != nullptr) {
             m_Cursor.error(m_Cursor.position(),
                            "the result of a call goes to a variable, not to an element");
         }
         pAssign->Kind = StatementKind::Call;
-        m_Cursor.advance();
-        return parseCall(pAssign, Callee);
+        return parseCall(pAssign);
     }
     pAssign->pValue = m_Expressions.parse().pRoot;
     return pAssign->pValue != nullptr ? pAssign : nullptr;
@@ -636,43 +650,52 @@ bool StatementParser::resolveTarget(Statement& Assign, NameEntry& Entry) {
     return true;
 }
 
-/// The cursor stands on the opening parenthesis.
-Statement* StatementParser::parseCall(Statement* pCall, NameEntry& Entry) {
+/// The cursor stands on the name of what is called, a parenthesis behind it.
+Statement* StatementParser::parseCall(Statement* pCall) {
+    NameEntry& Entry = m_Cursor.name();
+    const SourcePosition Position = m_Cursor.position();
     pCall->Name = Entry.Text;
-    resolveCallee(*pCall, Entry);
+    resolveCallee(*pCall, Entry, Position);
+    m_Cursor.advance();
     m_Cursor.advance();
     std::size_t ArgumentCount = 0;
     if (!m_Expressions.parseArguments(pCall->pArguments, ArgumentCount)) {
         return nullptr;
     }
-    checkCall(*pCall, ArgumentCount);
+    if (isBetween(m_Cursor.kind(), TokenKind::Star, TokenKind::OrOr)) {
+        m_Cursor.error(Position, "a call cannot stand in an expression: assign the result of " +
+                                     quotedName(Entry.Text) + " to a variable first");
+        return nullptr;
+    }
+    checkCall(*pCall, Position, ArgumentCount);
     return pCall;
 }
 
-void StatementParser::resolveCallee(Statement& Call, NameEntry& Entry) {
+void StatementParser::resolveCallee(Statement& Call, NameEntry& Entry, SourcePosition Position) {
     if (Entry.pLocal == nullptr && Entry.Kind == SymbolKind::Procedure) {
         Call.pProcedure = Entry.pProcedure;
         m_State.Calls.push_back({m_pOwner->Index, Call.pProcedure->Index});
         if (Entry.Text == "main") {
-            m_Cursor.error(Call.Position, "'main' cannot be called");
+            m_Cursor.error(Position, "'main' cannot be called");
         }
     } else if (Entry.pLocal == nullptr && Entry.Kind == SymbolKind::Extern) {
         Call.pExtern = Entry.pExtern;
     } else if (Entry.pLocal == nullptr && Entry.Kind == SymbolKind::None) {
-        m_Expressions.reportUndeclared(Entry, Call.Position);
+        m_Expressions.reportUndeclared(Entry, Position);
     } else {
-        m_Cursor.error(Call.Position, quotedName(Entry.Text) + " is not a procedure");
+        m_Cursor.error(Position, quotedName(Entry.Text) + " is not a procedure");
     }
 }
 
-void StatementParser::checkCall(const Statement& Call, std::size_t ArgumentCount) {
+void StatementParser::checkCall(const Statement& Call, SourcePosition Position,
+                                std::size_t ArgumentCount) {
     const std::string Name = quotedName(Call.Name);
     if (Call.pExtern != nullptr) {
         if (ArgumentCount != 0) {
-            m_Cursor.error(Call.Position, "extern " + Name + " takes no arguments");
+            m_Cursor.error(Position, "extern " + Name + " takes no arguments");
         }
         if (Call.pTarget != nullptr) {
-            m_Cursor.error(Call.Position, "extern " + Name + " has no result");
+            m_Cursor.error(Position, "extern " + Name + " has no result");
         }
         return;
     }
@@ -681,12 +704,12 @@ void StatementParser::checkCall(const Statement& Call, std::size_t ArgumentCount
     }
     const std::size_t Wanted = Call.pProcedure->Formals.size();
     if (ArgumentCount != Wanted) {
-        m_Cursor.error(Call.Position, Name + " takes " + std::to_string(Wanted) +
-                                          (Wanted == 1 ? " argument, not " : " arguments, not ") +
-                                          std::to_string(ArgumentCount));
+        m_Cursor.error(Position, Name + " takes " + std::to_string(Wanted) +
+                                     (Wanted == 1 ? " argument, not " : " arguments, not ") +
+                                     std::to_string(ArgumentCount));
     }
     if (Call.pTarget != nullptr && Call.pProcedure->pResult == nullptr) {
-        m_Cursor.error(Call.Position, Name + " has no result");
+        m_Cursor.error(Position, Name + " has no result");
     }
 }
 

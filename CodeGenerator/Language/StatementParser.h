@@ -32,6 +32,7 @@ private:
         FrameKind Kind;
         bool IsBraced;
         bool HasDefault;
+        bool HasBadHead;        ///< a mistake was reported in front of its inner statements
         Statement* pStatement;  ///< null for Body
         Statement** ppNext;     ///< where the next inner statement is linked
         std::size_t FirstLocal; ///< number of locals that were visible before
@@ -78,8 +79,9 @@ private:
     Statement* parseStepPrefix();
     Statement* parseNamed();
     Statement* parseAssignment(Statement* pAssign, NameEntry& Entry);
-    Statement* parseCall(Statement* pCall, NameEntry& Entry);
+    Statement* parseCall(Statement* pCall);
     Statement* parseLocal();
+    bool parseLocalValue(Statement& Decl);
     Statement* parseReturn();
     Statement* parseGoto();
     Statement* parseLeave();
@@ -97,14 +99,14 @@ private:
     Expression* parseCondition();
 
     bool resolveTarget(Statement& Assign, NameEntry& Entry);
-    void resolveCallee(Statement& Call, NameEntry& Entry);
-    void checkCall(const Statement& Call, std::size_t ArgumentCount);
+    void resolveCallee(Statement& Call, NameEntry& Entry, SourcePosition Position);
+    void checkCall(const Statement& Call, SourcePosition Position, std::size_t ArgumentCount);
     /// The statement is `x++` or `x--`; passes the operator.
     void makeStep(Statement& Assign);
     bool startsCall() const;
 
     Statement* makeStatement(StatementKind Kind, SourcePosition Position);
-    /// Links a statement to the innermost open one.
+    /// Links a statement, and those linked behind it, to the innermost open one.
     void append(Statement* pStatement);
     /// Opens a statement; its inner ones follow, in braces or not.
     void open(FrameKind Kind, Statement* pStatement, Statement** ppFirst, std::size_t FirstLocal);
@@ -112,6 +114,8 @@ private:
     void complete();
     /// Ends the innermost statement. False if it goes on (`else`).
     bool closeFrame();
+    /// Takes the innermost statement off the stack, whether it is whole or not.
+    void popFrame();
     bool continueWithElse(Frame& Innermost);
     void finishDo(Statement* pDo);
     /// Innermost open switch, if nothing else is open in it; else null, after a message.
@@ -124,6 +128,7 @@ private:
     std::vector<Frame> m_Frames;
     std::vector<NameEntry*>
         m_Visible; ///< names of the locals that are visible, in order of declaration
+    std::size_t m_ErrorsBefore = 0; ///< errors when the present step began
     std::size_t m_OpenLoops = 0;
     std::size_t m_OpenSwitches = 0;
     bool m_IsHead = false; ///< in the head of a `for`, where no call can stand

@@ -13,8 +13,8 @@ enum class TokenKind : std::uint8_t {
     Identifier,
     Number,
 
-    // Words that begin a declaration. None of them can stand in a procedure, so they are where reading takes up again
-    // after a mistake.
+    // Words that begin a declaration. None of them can stand in a procedure, so they are where
+    // reading takes up again after a mistake.
     Type,
     Input,
     Output,
@@ -124,10 +124,12 @@ struct Token {
     TokenKind Kind : 8;
     std::uint32_t Length : 24;
     std::uint32_t Offset;
-    std::uint32_t Value; ///< Identifier: its number in the name table; Number: its place in TokenList::Numbers
+    std::uint32_t Value; ///< Identifier: its number in the name table; Number: its place in
+                         ///< TokenList::Numbers
 };
 
-/// One file's tokens. Two End tokens close the list, so that the one behind the current can always be looked at.
+/// One file's tokens. Two End tokens close the list, so that the one behind the current can always
+/// be looked at.
 struct TokenList {
     std::vector<Token> Tokens;
     std::vector<double> Numbers;

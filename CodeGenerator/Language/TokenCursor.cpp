@@ -65,7 +65,18 @@ void TokenCursor::recoverStatement() {
 }
 
 void TokenCursor::recoverParenthesis() {
+    recoverParenthesis(false);
+}
+
+void TokenCursor::recoverForHead() {
+    recoverParenthesis(true);
+}
+
+void TokenCursor::recoverParenthesis(bool PassSemicolons) {
     for (std::size_t Depth = 0; !isRecoveryPoint(); pass()) {
+        if (is(TokenKind::Semicolon) && !PassSemicolons) {
+            return;
+        }
         if (is(TokenKind::ParenOpen)) {
             ++Depth;
         } else if (is(TokenKind::ParenClose) && Depth-- == 0) {

@@ -12,8 +12,8 @@
 
 namespace hpn {
 
-/// A place in one file's tokens, with what every parser needs there: look, go on, complain, take up again after a mistake. Never
-/// leaves the list: the End token is not passed.
+/// A place in one file's tokens, with what every parser needs there: look, go on, complain, take up
+/// again after a mistake. Never leaves the list: the End token is not passed.
 class TokenCursor {
 public:
     TokenCursor(const SourceFiles& Sources, std::uint32_t File, const TokenList& List,
@@ -40,7 +40,8 @@ public:
     }
     /// Passes the token or says "expected WHAT before ...".
     bool expect(TokenKind Kind, const char* What);
-    /// A semicolon. If it is missing, the mistake is shown behind the token before, where it should have been.
+    /// A semicolon. If it is missing, the mistake is shown behind the token before, where it should
+    /// have been.
     bool expectSemicolon();
 
     std::uint32_t getPlace() const {
@@ -60,17 +61,23 @@ public:
     void warning(SourcePosition Position, std::string Text) const {
         m_Messages.warning(Position, std::move(Text));
     }
-    /// "expected WHAT before the current token"; silent if the lexer has complained about that token.
+    /// "expected WHAT before the current token"; silent if the lexer has complained about that
+    /// token.
     void expected(const char* What) const;
     /// The token begins a line.
     bool isFirstOnLine() const;
 
-    // Taking up again after a mistake. Names that are passed over become suspect: what they would have declared is unknown.
+    // Taking up again after a mistake. Names that are passed over become suspect: what they would
+    // have declared is unknown.
 
-    /// To behind the next semicolon, or in front of a brace, a statement's keyword, a declaration or the end.
+    /// To behind the next semicolon, or in front of a brace, a statement's keyword, a declaration
+    /// or the end.
     void recoverStatement();
-    /// To behind the parenthesis that closes the one already open; stops like recoverStatement.
+    /// To behind the parenthesis that closes the one already open, or in front of what begins or
+    /// ends a statement.
     void recoverParenthesis();
+    /// The same in the head of a `for`, which holds semicolons.
+    void recoverForHead();
     /// To behind the next semicolon, or in front of the next declaration.
     void recoverDeclaration();
     /// To the opening brace of a procedure's body; false if none comes.
@@ -79,6 +86,7 @@ public:
 
 private:
     bool isRecoveryPoint() const;
+    void recoverParenthesis(bool PassSemicolons);
     void pass();
 
     std::string_view m_Text;

@@ -55,12 +55,12 @@ bool TypeChecker::checkScaling() {
         return fail(Which, "only integer types can be scaled");
     }
     if (!(m_Type.Lsb >= SmallestLsb && m_Type.Lsb <= GreatestLsb)) {
-        return fail(Which, "lsb is " + numberText(m_Type.Lsb) +
-                               "; it must lie between 1e-100 and 1e100");
+        return fail(Which,
+                    "lsb is " + numberText(m_Type.Lsb) + "; it must lie between 1e-100 and 1e100");
     }
-    // Every raw number must lead to a number of its own and back; a double has 53 bits for that, and some are kept
-    // for the rounding of the two operations.
-    constexpr double RawNumbers = 4294967296.0;   // 2^32
+    // Every raw number must lead to a number of its own and back; a double has 53 bits for that,
+    // and some are kept for the rounding of the two operations.
+    constexpr double RawNumbers = 4294967296.0;         // 2^32
     constexpr double ExactNumbers = 1125899906842624.0; // 2^50
     if (!(std::fabs(m_Type.Offset) / m_Type.Lsb + RawNumbers < ExactNumbers)) {
         return fail(has(Offset) ? Offset : Lsb,
@@ -109,12 +109,14 @@ bool TypeChecker::placeOnGrid(double& Limit) {
     const auto Smallest = static_cast<double>(smallestRaw(m_Type.Base));
     const auto Greatest = static_cast<double>(greatestRaw(m_Type.Base));
     if (Nearest < Smallest || Nearest > Greatest) {
-        return fail(Range, "limit " + numberText(Limit) + " lies outside the storage, which holds " +
+        return fail(Range, "limit " + numberText(Limit) +
+                               " lies outside the storage, which holds " +
                                numberText(Smallest * m_Type.Lsb + m_Type.Offset) + " to " +
                                numberText(Greatest * m_Type.Lsb + m_Type.Offset));
     }
     if (std::fabs(Raw - Nearest) > Tolerance) {
-        return fail(Range, "limit " + numberText(Limit) + " is not on the grid of the type, whose step is " +
+        return fail(Range, "limit " + numberText(Limit) +
+                               " is not on the grid of the type, whose step is " +
                                numberText(m_Type.Lsb));
     }
     Limit = numberOfRaw(static_cast<std::int64_t>(Nearest), m_Type) + 0.0;

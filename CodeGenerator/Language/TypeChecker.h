@@ -10,9 +10,10 @@
 
 namespace hpn {
 
-/// Judges the options of one declared type: which may stand together, whether its grid is exact in a double, whether its limits lie
-/// in the storage and on the grid. Puts limits on the grid exactly, so that a clipped number is one the variable can hold.
-/// A type with a mistake is left unscaled and without a range, so that it causes no others.
+/// Judges the options of one declared type: which may stand together, whether its grid is exact in
+/// a double, whether its limits lie in the storage and on the grid. Puts limits on the grid
+/// exactly, so that a clipped number is one the variable can hold. A type with a mistake is left
+/// unscaled and without a range, so that it causes no others.
 class TypeChecker {
 public:
     TypeChecker(Diagnostics& Messages, Type& Declared) : m_Messages(Messages), m_Type(Declared) {}
