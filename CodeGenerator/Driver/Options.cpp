@@ -23,6 +23,9 @@ const char* const Examples =
     "                                          one picture of the graph after each pass, for "
     "graphviz:\n"
     "                                          dot -Tsvg dots/08_*.dot -o step8.svg\n"
+    "  hpncg cruise.hpn --extract-labels -o cruise.c\n"
+    "                                          shared labels become procedures; remarks tell which "
+    "do not\n"
     "  hpncg --no-optimize - < cruise.hpn      the code as written, to standard output\n"
     "  hpncg --print a.hpn b.hpn               the program in its canonical form\n"
     "\n"
@@ -45,6 +48,7 @@ std::string describePasses() {
 // The words of the command line before they are checked against each other.
 struct Words {
     bool IsNotOptimized = false;
+    bool IsExtractionWanted = false;
     std::string Passes;
     std::string Statistics;
 };
@@ -61,6 +65,8 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
         ->type_name("LIST")
         ->expected(1)
         ->excludes(pNone);
+    App.add_flag("--extract-labels", Given.IsExtractionWanted,
+                 "First make procedures of the labels that are reached from several places");
     App.add_option("--dump-dot", Result.DotDirectory, "Write the graph after each pass as DOT file")
         ->type_name("DIR");
     App.add_option("--dump-html", Result.HtmlDirectory,
@@ -86,6 +92,8 @@ std::string checkOptions(const CLI::App& App, const Words& Given, Options& Resul
     } else if (!Given.IsNotOptimized) {
         Result.Passes = PassSequence::defaultOrder();
     }
+    if (Given.IsExtractionWanted)
+        Result.Passes.extractLabelsFirst();
     if (Given.Statistics == "json")
         Result.Statistics = StatisticsForm::Json;
     else if (Given.Statistics == "text")

@@ -20,9 +20,10 @@ namespace {
     Text += '\n';
 }
 
-void appendCounts(std::string& Text, const char* Name, const GraphCounts& Counts) {
-    appendLine(Text, "%-36s %10zu %10zu %10zu %10zu %10zu", Name, Counts.Statements,
-               Counts.Conditions, Counts.Procedures, Counts.Blocks, Counts.Nodes);
+void appendCounts(std::string& Text, const char* Name, const GraphCounts& Counts,
+                  const std::string& Effect = "") {
+    appendLine(Text, "%-36s %10zu %10zu %10zu %10zu %10zu%s", Name, Counts.Statements,
+               Counts.Conditions, Counts.Procedures, Counts.Blocks, Counts.Nodes, Effect.c_str());
 }
 
 // The single figures, under the names that both forms of the report use.
@@ -33,6 +34,7 @@ struct Figure {
 };
 
 const Figure Figures[] = {
+    {"proceduresExtracted", "procedures extracted", &Statistics::ProceduresExtracted},
     {"proceduresInlined", "procedures inlined", &Statistics::ProceduresInlined},
     {"recursiveProcedures", "  not inlined: call themselves", &Statistics::RecursiveProcedures},
     {"exportedProcedures", "  not inlined: called from outside", &Statistics::ExportedProcedures},
@@ -59,7 +61,8 @@ std::string printStatistics(const Statistics& Counts) {
                "blocks", "nodes");
     appendCounts(Text, "as written", Counts.Before);
     for (const Statistics::Record& Each : Counts.Passes)
-        appendCounts(Text, Each.PassName, Each.After);
+        appendCounts(Text, Each.PassName, Each.After,
+                     "   " + std::to_string(Each.Figure) + " " + Each.What);
     Text += '\n';
     for (const Figure& Each : Figures)
         appendLine(Text, "%-36s %10zu", Each.Title, Counts.*Each.pValue);
@@ -75,7 +78,10 @@ std::string printStatisticsAsJson(const Statistics& Counts, const std::string& P
         Root[Each.Key] = Counts.*Each.pValue;
     Root["passes"] = nlohmann::ordered_json::array();
     for (const Statistics::Record& Each : Counts.Passes)
-        Root["passes"].push_back({{"name", Each.PassName}, {"after", toJson(Each.After)}});
+        Root["passes"].push_back({{"name", Each.PassName},
+                                  {"figure", Each.Figure},
+                                  {"what", Each.What},
+                                  {"after", toJson(Each.After)}});
     using Handler = nlohmann::ordered_json::error_handler_t;
     return Root.dump(2, ' ', false, Handler::replace) + "\n";
 }

@@ -94,6 +94,17 @@ void printWarnings(const SourceFiles& Sources) {
     std::fputs(Messages.print().c_str(), stderr);
 }
 
+// What the passes found worth telling; nothing of it is a mistake.
+void printRemarks(const SourceFiles& Sources, const std::vector<Remark>& Remarks) {
+    for (const Remark& Each : Remarks) {
+        const LineAndColumn Place = Sources.locate(Each.Position);
+        std::fprintf(stderr, "%s:%zu:%zu: remark: %s\n",
+                     Sources.getName(Each.Position.File).c_str(),
+                     static_cast<std::size_t>(Place.Line), static_cast<std::size_t>(Place.Column),
+                     Each.Text.c_str());
+    }
+}
+
 // The observers of one run, as far as they are wanted.
 struct Watchers {
     Watchers(const Options& Wanted, PassRunner& Runner, InternalErrors& Errors)
@@ -150,6 +161,7 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
         return ExitWrongUse;
     const bool IsRun = Runner.run(Wanted.Passes);
     printWarnings(Sources);
+    printRemarks(Sources, Graph.getRemarks());
     if (!Watching.Dump.getFailedFile().empty()) {
         reportWrongUse("cannot write '" + Watching.Dump.getFailedFile() + "'");
         return ExitWrongUse;

@@ -31,7 +31,7 @@ constexpr std::size_t ElementsOneByOne = 8; // arrays up to this size are initia
 class ProgramWriter {
 public:
     ProgramWriter(ProgramGraph& Graph, const EmitOptions& Options)
-        : m_Source(Graph.getProgram()), m_Options(Options), m_Functions(Graph),
+        : m_Graph(Graph), m_Source(Graph.getProgram()), m_Options(Options), m_Functions(Graph),
           m_Writer(m_Functions, m_FileNames, m_FunctionNames, m_ExternNames, m_Names, m_Text) {}
     EmittedProgram run();
 
@@ -53,6 +53,7 @@ private:
     void writeStartValue(const Variable& Declaration);
     void writeStartLoop(const Variable& Declaration, const std::string& Name);
 
+    const ProgramGraph& m_Graph;
     const Program& m_Source;
     const EmitOptions& m_Options;
     EmittedFunctions m_Functions;
@@ -126,8 +127,9 @@ void ProgramWriter::nameEverything() {
     const std::string StepName = fileName(m_Source.Name + "_step");
     for (const EmittedFunction& Function : m_Functions.getAll())
         m_FunctionNames.push_back(Function.pSource && Function.pSource->IsMain ? StepName
-                                  : Function.pSource ? fileName(Function.pSource->Name)
-                                                     : fileName(Function.ProcedureName));
+                                  : Function.pSource
+                                      ? fileName(Function.pSource->Name)
+                                      : fileName(m_Graph.readableNameOf(Function.ProcedureName)));
     for (const Variable* pVariable : m_AtFileScope) {
         if (!pVariable->pOwner)
             continue;

@@ -124,6 +124,19 @@ void ExpressionWriter::writeCondition(const Term* pTerm, bool Negated) {
     condition(analyse(pTerm), Negated);
 }
 
+void ExpressionWriter::writeTests(const BranchTests& Tests, bool Negated) {
+    const char* pJoint = "";
+    for (const BranchTest& Test : Tests) {
+        m_Out += pJoint;
+        const std::size_t Start = m_Out.size();
+        m_Nodes.clear();
+        const Piece Asked = condition(analyse(Test.pTerm), Test.Negated != Negated);
+        if (Tests.size() > 1 && Asked.Binding != (Negated ? And : Or))
+            bind(Start, Asked, Equality);
+        pJoint = Negated ? " && " : " || ";
+    }
+}
+
 ExpressionWriter::Piece ExpressionWriter::decided(bool Holds) {
     m_Out += Holds ? '1' : '0';
     return {CType::Int, Primary, false};
@@ -152,15 +165,53 @@ ExpressionWriter::Piece ExpressionWriter::condition(int Index, bool Negated) {
     }
 }
 
+/// A number to be compared. Compilers take some sums and exclusive ors of narrow unsigned operands
+/// for complements of promoted values, after they have put in what they know of constants, and
+/// warn; behind a call they do not see it.
+ExpressionWriter::Piece ExpressionWriter::compared(int Index) {
+    const std::size_t Start = m_Out.size();
+    const Piece Number = value(Index, false);
+    while (m_Nodes[Index].Op == Operator::Cast)
+        Index = m_Nodes[Index].Left;
+    if (Number.Type == CType::Int && looksLikeComplement(m_Nodes[Index]))
+        return wrapInCall(Start, "hpn_value32", CType::Int);
+    return Number;
+}
+
+bool ExpressionWriter::looksLikeComplement(const Node& Of) const {
+    const auto isLeaf = [&](int Index) { return m_Nodes[Index].Left == -1; };
+    if (Of.Op == Operator::Negate)
+        return !isLeaf(Of.Left);
+    if (Of.Op == Operator::Subtract) {
+        const Operator Left = m_Nodes[Of.Left].Op;
+        return Left == Operator::Negate || (Left == Operator::Number && !isLeaf(Of.Right));
+    }
+    if (Of.Op != Operator::BitXor)
+        return false;
+    const auto isNarrowMask = [&](int Index) {
+        const Node& Mask = m_Nodes[Index];
+        if (Mask.Op == Operator::Variable)
+            return originalOf(Mask.pTerm->pVariable)->getDeclaration().Kind == VariableKind::Param;
+        return Mask.Op == Operator::Number && (Mask.Number == 255.0 || Mask.Number == 65535.0);
+    };
+    return isNarrowMask(Of.Left) || isNarrowMask(Of.Right);
+}
+
+/// What a mask or the range decides already, but inputs are read for, is compared as a double: no
+/// compiler takes that for a slip.
 ExpressionWriter::Piece ExpressionWriter::unequalZero(int Index, bool Negated) {
     const std::size_t Start = m_Out.size();
     const Operator Op = Negated ? Operator::Equal : Operator::NotEqual;
     Piece Result{};
     if (isScaledRead(Index) && compareRawWithNumber(Index, 0.0, Op, Result))
         return Result;
-    if (isMaskDecided(Index, 0.0) && !m_Nodes[Index].ReadsInput)
+    const bool IsDecided = isMaskDecided(Index, 0.0) || m_Nodes[Index].Range.Low > 0.0 ||
+                           m_Nodes[Index].Range.High < 0.0;
+    if (IsDecided && !m_Nodes[Index].ReadsInput)
         return decided(!Negated);
-    Piece Number = value(Index, false);
+    Piece Number = compared(Index);
+    if (IsDecided && Number.Type != CType::Double)
+        Number = cast(Start, Number, "double", CType::Double);
     if (Number.IsTruth && !Negated)
         return Number;
     if (Number.IsTruth) {
@@ -179,7 +230,9 @@ ExpressionWriter::Piece ExpressionWriter::unequalZero(int Index, bool Negated) {
 ExpressionWriter::Piece ExpressionWriter::equalOne(int Index) {
     if (m_Nodes[Index].Op == Operator::Number)
         return decided(m_Nodes[Index].Number == 1.0);
-    if (isMaskDecided(Index, 1.0) && !m_Nodes[Index].ReadsInput)
+    const bool IsDecided = isMaskDecided(Index, 1.0) || m_Nodes[Index].Range.Low > 1.0 ||
+                           m_Nodes[Index].Range.High < 1.0;
+    if (IsDecided && !m_Nodes[Index].ReadsInput)
         return decided(false);
     if (isTruthRange(m_Nodes[Index].Range))
         return condition(Index, false);
@@ -187,7 +240,9 @@ ExpressionWriter::Piece ExpressionWriter::equalOne(int Index) {
     if (isScaledRead(Index) && compareRawWithNumber(Index, 1.0, Operator::Equal, Result))
         return Result;
     const std::size_t Start = m_Out.size();
-    const Piece Number = value(Index, false);
+    Piece Number = compared(Index);
+    if (IsDecided && Number.Type != CType::Double)
+        Number = cast(Start, Number, "double", CType::Double);
     bind(Start, Number, Sum);
     const bool IsFloating = Number.Type == CType::Double || Number.Type == CType::Float;
     m_Out += IsFloating ? " == 1.0" : Number.Type == CType::UInt32 ? " == 1u" : " == 1";
@@ -240,11 +295,35 @@ bool ExpressionWriter::isMaskDecided(int Masked, double Number) const {
     return false;
 }
 
+/// A cast to a narrow integer keeps only bits that a mask has set or cleared.
+bool ExpressionWriter::isMaskedAway(const Node& Cast, double& Number) const {
+    const hpn::Type& To = *Cast.pTerm->pType;
+    const Node& Of = m_Nodes[Cast.Left];
+    const unsigned Width = widthOf(To.Base);
+    if (Width == 32 || isScaled(To) || To.SaturatesLow || To.SaturatesHigh ||
+        (Of.Op != Operator::BitAnd && Of.Op != Operator::BitOr))
+        return false;
+    const std::uint32_t Bits = (1u << Width) - 1u;
+    for (int Operand : {Of.Left, Of.Right}) {
+        if (m_Nodes[Operand].Op != Operator::Number)
+            continue;
+        const std::uint32_t Mask =
+            static_cast<std::uint32_t>(truncateTo32(m_Nodes[Operand].Number)) & Bits;
+        if (Mask != (Of.Op == Operator::BitOr ? Bits : 0u))
+            continue;
+        Number = convertNumber(Mask, To);
+        return true;
+    }
+    return false;
+}
+
 /// Comparisons that hold always or never for another reason than the ranges: equal operands, bits
 /// that a mask sets or clears.
 bool ExpressionWriter::isDecidedByShape(const Node& Of, double& Number) const {
     if (Of.Op == Operator::LogicalNot)
         return isMaskDecided(Of.Left, 0.0);
+    if (Of.Op == Operator::Cast)
+        return isMaskedAway(Of, Number);
     if (Of.Op < Operator::Less || Of.Op > Operator::NotEqual)
         return false;
     const Node& Left = m_Nodes[Of.Left];
@@ -342,9 +421,7 @@ bool ExpressionWriter::compareRawWithNumber(int Scaled, double Number, Operator 
 /// Compares integers; C compares an int and an unsigned one as unsigned, so one of them is widened.
 ExpressionWriter::Piece ExpressionWriter::compareWhole(int Left, int Right, Operator Op,
                                                        bool OfRaws) {
-    const auto write = [&](int Index) {
-        return OfRaws ? raw(m_Nodes[Index]) : value(Index, false);
-    };
+    const auto write = [&](int Index) { return OfRaws ? raw(m_Nodes[Index]) : compared(Index); };
     const std::size_t Start = m_Out.size();
     const std::size_t ReadsBefore = m_Reads.size();
     Piece First = write(Left);
@@ -362,7 +439,7 @@ ExpressionWriter::Piece ExpressionWriter::compareWhole(int Left, int Right, Oper
     const bool SecondWidens = Second.Type == CType::UInt32 && First.Type == CType::Int;
     if (FirstWidens && m_Nodes[Right].Op == Operator::Number) {
         Rest += 'u';
-    } else if (SecondWidens) {
+    } else if (SecondWidens || IsSameText) {
         Second = cast(AfterFirst, Second, "int64_t", CType::Int64);
         Rest = m_Out.substr(AfterFirst);
     }

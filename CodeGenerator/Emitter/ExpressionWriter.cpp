@@ -1,6 +1,7 @@
 #include "Emitter/ExpressionWriter.h"
 
 #include "Emitter/CLiterals.h"
+#include "Model/Arithmetic.h"
 #include "Model/Conversion.h"
 #include "Model/ZfCCfgSFVariable.h"
 
@@ -98,11 +99,45 @@ int ExpressionWriter::analyse(const Term* pTerm) {
     if (Result.Range.isSingle() && !Result.ReadsInput)
         return analyseNumber(Result.Range.Low);
     double Number = 0.0;
+    if (isConstant(Result, Number))
+        return analyseNumber(Number);
     if (!Result.ReadsInput && isDecidedByShape(Result, Number))
         return analyseNumber(Number);
+    turnIntoComplement(Result);
     Result.Kind = kindOf(Result);
     m_Nodes.push_back(Result);
     return static_cast<int>(m_Nodes.size()) - 1;
+}
+
+/// An operator on numbers only.
+bool ExpressionWriter::isConstant(const Node& Of, double& Number) const {
+    const auto isNumber = [&](int Index) { return m_Nodes[Index].Op == Operator::Number; };
+    if (Of.pType || !isNumber(Of.Left) || (Of.Right != -1 && !isNumber(Of.Right)))
+        return false;
+    const double Left = m_Nodes[Of.Left].Number;
+    if (Of.Op == Operator::Cast)
+        Number = convertNumber(Left, *Of.pTerm->pType);
+    else
+        Number = Of.Right == -1 ? computeUnary(Of.Op, Left)
+                                : computeBinary(Of.Op, Left, m_Nodes[Of.Right].Number);
+    return true;
+}
+
+/// `x ^ -1` and `-1 - x` are complements to a C compiler, so they are written like those.
+void ExpressionWriter::turnIntoComplement(Node& Of) const {
+    if (Of.Op != Operator::BitXor && Of.Op != Operator::Subtract)
+        return;
+    const auto isMinusOne = [&](int Index) {
+        return m_Nodes[Index].Op == Operator::Number && truncateTo32(m_Nodes[Index].Number) == -1;
+    };
+    if (Of.Op == Operator::BitXor && isMinusOne(Of.Right)) {
+        Of.Op = Operator::Complement;
+    } else if (isMinusOne(Of.Left) &&
+               (Of.Op == Operator::BitXor ||
+                (m_Nodes[Of.Right].Kind == Arithmetic::Int32 && m_Nodes[Of.Left].Number == -1.0))) {
+        Of.Op = Operator::Complement;
+        Of.Left = Of.Right;
+    }
 }
 
 ExpressionWriter::Arithmetic ExpressionWriter::kindOf(const Node& Of) const {
@@ -433,7 +468,12 @@ ExpressionWriter::Piece ExpressionWriter::quotient(const Node& Of, bool KeepZero
     const std::size_t AfterFirst = m_Out.size();
     m_Out += IsPlain ? " / " : ", ";
     const std::size_t StartOfSecond = m_Out.size();
-    const Piece Second = operandAsDouble(Of.Right, true);
+    Piece Second = operandAsDouble(Of.Right, true);
+    // A condition that is never true; a compiler would warn of the integer 0.
+    if (m_Out.compare(StartOfSecond, std::string::npos, "0") == 0) {
+        m_Out += ".0";
+        Second.Type = CType::Double;
+    }
     if (!IsPlain) {
         m_Out += ')';
         return {CType::Double, Primary, false};
@@ -485,6 +525,10 @@ ExpressionWriter::Piece ExpressionWriter::truncatedQuotient(const Node& Of) {
 ExpressionWriter::Piece ExpressionWriter::truncated32(int Index) {
     const Node& Of = m_Nodes[Index];
     const std::size_t Start = m_Out.size();
+    if (Of.Op == Operator::Number) {
+        appendInteger(m_Out, truncateTo32(Of.Number));
+        return {CType::Int, m_Out[Start] == '-' ? Prefix : Primary, false};
+    }
     const bool Divides = isDivisionTruncating(Of);
     if (Divides || isWhole(Index)) {
         const Piece Whole = Divides ? truncatedQuotient(Of) : value(Index, false);
@@ -526,7 +570,11 @@ ExpressionWriter::Piece ExpressionWriter::bitOperation(const Node& Of) {
         bindBeside(Start, First, Prefix);
     m_Out += IsAnd ? " & " : IsOr ? " | " : " ^ ";
     const std::size_t StartOfSecond = m_Out.size();
-    bindBeside(StartOfSecond, bitOperand(Of.Right), Prefix);
+    Piece Second = bitOperand(Of.Right);
+    // Of two truth values a compiler would rather see them joined by a logical operator.
+    if (First.IsTruth && Second.IsTruth)
+        Second = cast(StartOfSecond, Second, "int32_t", CType::Int);
+    bindBeside(StartOfSecond, Second, Prefix);
     return {CType::Int, Binding, false};
 }
 
@@ -580,12 +628,11 @@ ExpressionWriter::Piece ExpressionWriter::remainder(const Node& Of) {
 
 void ExpressionWriter::element(const Variable& Array, int Index) {
     const Node& Of = m_Nodes[Index];
-    const double Last = Array.Count - 1.0;
+    const std::int64_t Last = static_cast<std::int64_t>(Array.Count) - 1;
     m_Out += m_Names.nameOf(Array);
     m_Out += '[';
     if (Of.Op == Operator::Number) {
-        const double Whole = computeBinary(Operator::BitOr, Of.Number, 0.0);
-        appendInteger(m_Out, static_cast<std::int64_t>(std::clamp(Whole, 0.0, Last)));
+        appendInteger(m_Out, std::clamp<std::int64_t>(truncateTo32(Of.Number), 0, Last));
     } else if (!Of.Range.MayBeNaN && Of.Range.Low > -1.0 && Of.Range.High < Array.Count) {
         truncated32(Index);
     } else {

@@ -1,6 +1,7 @@
 #ifndef EXPRESSIONWRITER_H
 #define EXPRESSIONWRITER_H
 
+#include "Emitter/BranchTest.h"
 #include "Language/Program.h"
 #include "Model/Term.h"
 
@@ -38,6 +39,8 @@ public:
     void writeStored(const Term* pTerm, const Type& To, bool KeepNaN);
     /// The term as a C condition, or its negation.
     void writeCondition(const Term* pTerm, bool Negated);
+    /// Several of them joined by `||`, or the negation of that.
+    void writeTests(const BranchTests& Tests, bool Negated);
     /// `name[index]` with the index brought into the array.
     void writeElement(const Variable& Array, const Term* pIndex);
     /// The variables whose names were written as reads since `clearReads`, one for each place. A
@@ -91,6 +94,8 @@ private:
 
     int analyse(const Term* pTerm);
     int analyseNumber(double Number);
+    bool isConstant(const Node& Of, double& Number) const;
+    void turnIntoComplement(Node& Of) const;
     Arithmetic kindOf(const Node& Of) const;
     Arithmetic kindOfCast(const Node& Of) const;
     Arithmetic kindOfArithmetic(const Node& Of) const;
@@ -122,12 +127,15 @@ private:
     Piece truncated32(int Index);
 
     Piece condition(int Index, bool Negated);
+    Piece compared(int Index);
+    bool looksLikeComplement(const Node& Of) const;
     Piece unequalZero(int Index, bool Negated);
     Piece logical(const Node& Of, bool Negated);
     Piece equalOne(int Index);
     Piece comparison(const Node& Of, bool Negated);
     bool isScaledRead(int Index) const;
     bool isMaskDecided(int Masked, double Number) const;
+    bool isMaskedAway(const Node& Cast, double& Number) const;
     bool isDecidedByShape(const Node& Of, double& Number) const;
     bool compareRaw(const Node& Of, Operator Op, Piece& Result);
     bool compareRawWithNumber(int Scaled, double Number, Operator Op, Piece& Result);

@@ -1,5 +1,6 @@
 #include "Emitter/FlowReader.h"
 
+#include "Emitter/TestJoiner.h"
 #include "Model/ZfCCfgSFExpression.h"
 #include "Model/ZfCCfgSFProcedureCall.h"
 #include "ZfCBasicBlock.h"
@@ -267,6 +268,7 @@ ProcedureFlow FlowReader::assemble() {
     for (int Leader : Leaders)
         appendPiece(Leader, NumberOf, Result);
     Result.FirstItem.push_back(Result.Items.size());
+    joinTests(Result);
     return Result;
 }
 
@@ -296,7 +298,9 @@ void FlowReader::appendPiece(int Leader, const std::vector<int>& NumberOf, Proce
     Flow.True = pieceOf(Last.True);
     Flow.False = pieceOf(Last.False);
     Result.Nodes.push_back(Flow);
-    Result.Conditions.push_back(Last.pCondition);
+    Result.Tests.emplace_back();
+    if (Last.pCondition)
+        Result.Tests.back().push_back({Last.pCondition, false});
 }
 
 } // namespace hpn

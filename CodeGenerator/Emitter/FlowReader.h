@@ -1,6 +1,7 @@
 #ifndef FLOWREADER_H
 #define FLOWREADER_H
 
+#include "Emitter/BranchTest.h"
 #include "Emitter/Structurer.h"
 #include "Graph/ProgramGraph.h"
 
@@ -32,11 +33,11 @@ struct FlowItem {
 };
 
 /// A procedure's code in straight pieces: node i of `Nodes` has the items [FirstItem[i],
-/// FirstItem[i + 1]) and, if it is a branch, the condition pCondition[i].
+/// FirstItem[i + 1]) and, if it is a branch, the tests Tests[i].
 struct ProcedureFlow {
     std::vector<FlowNode> Nodes; ///< none: the procedure does nothing
     std::vector<std::size_t> FirstItem;
-    std::vector<const Term*> Conditions;
+    std::vector<BranchTests> Tests; ///< by node, none: no branch
     std::vector<FlowItem> Items;
     std::vector<const Variable*>
         Parameters;         ///< of the parameter statements that stand in the blocks

@@ -125,7 +125,7 @@ std::string FunctionWriter::labelOf(int Node) {
 void FunctionWriter::open(const char* pText, const StructureToken& Token) {
     indent();
     m_Out += pText;
-    m_Expressions.writeCondition(m_pFunction->Flow.Conditions[Token.Node], Token.Negated);
+    m_Expressions.writeTests(m_pFunction->Flow.Tests[Token.Node], Token.Negated);
     m_Out += ") {\n";
     ++m_Depth;
 }
@@ -177,7 +177,7 @@ void FunctionWriter::writeToken(const StructureToken& Token, bool IsLast) {
         break;
     case StructureKind::EndDo:
         m_Out += "} while (";
-        m_Expressions.writeCondition(m_pFunction->Flow.Conditions[Token.Node], Token.Negated);
+        m_Expressions.writeTests(m_pFunction->Flow.Tests[Token.Node], Token.Negated);
         m_Out += ");\n";
         break;
     case StructureKind::Goto:

@@ -71,8 +71,9 @@ bool mayLoseReads(const Term* pTerm, bool& ReadsOwn, bool& Folds) {
     const bool IsPlain = pTerm->Op == Operator::Number || pTerm->Op == Operator::Variable ||
                          pTerm->Op == Operator::Element || pTerm->Op == Operator::Add ||
                          pTerm->Op == Operator::Subtract;
-    const bool Clips = pTerm->pType && (pTerm->pType->SaturatesHigh || pTerm->pType->SaturatesLow);
-    Folds = Folds || Clips || !(IsPlain || pTerm->Op == Operator::Cast);
+    const bool IsCopy = pTerm->Op == Operator::Cast && !pTerm->pLeft->pLeft &&
+                        !pTerm->pType->SaturatesHigh && !pTerm->pType->SaturatesLow;
+    Folds = Folds || !(IsPlain || IsCopy);
     for (const Term* pOperand : {pTerm->pLeft, pTerm->pRight})
         if (pOperand && !(ReadsOwn && Folds))
             mayLoseReads(pOperand, ReadsOwn, Folds);
@@ -115,10 +116,10 @@ void VariableUse::add(int Function, const ProcedureFlow& Flow) {
         if (Item.pTarget && Item.Kind == FlowItemKind::Assign)
             addWrite(Function, Item.pTarget);
     }
-    for (const Term* pCondition : Flow.Conditions)
-        if (pCondition)
-            addReads(Function, pCondition,
-                     [&](ExpressionWriter& Writer) { Writer.writeCondition(pCondition, false); });
+    for (const BranchTests& Tests : Flow.Tests)
+        for (const BranchTest& Test : Tests)
+            addReads(Function, Test.pTerm,
+                     [&](ExpressionWriter& Writer) { Writer.writeCondition(Test.pTerm, false); });
 }
 
 // ---- liveness ----
@@ -187,8 +188,8 @@ void EntryLiveness::scan(int Node) {
         if (Item.pTarget)
             write(Node, Item.pTarget);
     }
-    if (m_Flow.Conditions[Node])
-        forEachRead(m_Flow.Conditions[Node], reads);
+    for (const BranchTest& Test : m_Flow.Tests[Node])
+        forEachRead(Test.pTerm, reads);
 }
 
 bool EntryLiveness::reachesEntry(const Places& Of) {

@@ -1,7 +1,5 @@
 #include "Graph/FlowSketch.h"
 
-#include <utility>
-
 // Control flow out of structured statements and jumps.
 //
 // 1. Walk the statements with a stack of tasks. A compound statement pushes what is to be done
@@ -49,6 +47,7 @@ void FlowSketch::draw(const Procedure& Drawn) {
     m_Blocks.clear();
     m_Actions.clear();
     m_Labels.clear();
+    m_LabelOrder.clear();
     m_CanBypassDeclarations = false;
     m_LeavingBlock = SketchBlock::None;
     m_Current = newBlock();
@@ -290,6 +289,7 @@ std::int32_t FlowSketch::blockOfLabel(const Statement* pLabel) {
         return Found->second;
     const std::int32_t Block = newBlock();
     m_Labels.emplace(pLabel, Block);
+    m_LabelOrder.emplace_back(pLabel, Block);
     return Block;
 }
 

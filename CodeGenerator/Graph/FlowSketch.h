@@ -5,6 +5,7 @@
 
 #include <cstdint>
 #include <unordered_map>
+#include <utility>
 #include <vector>
 
 namespace hpn {
@@ -29,7 +30,9 @@ struct Action {
 };
 
 /// A block of the sketch. Without a condition control goes to Next, or leaves the procedure if that
-/// is none.
+/// is none. The two ways of a condition never lead to the same block: an arm without code has an
+/// empty block of its own. Where both edges of a dead branch ended in one phi function, the
+/// optimiser could not tell which operands go with them, and a living one would be lost.
 struct SketchBlock {
     static constexpr std::int32_t None = -1;
 
@@ -62,6 +65,11 @@ public:
     const std::vector<Action>& getActions() const { return m_Actions; }
     /// Control can come past a declaration, by a goto or a case.
     bool canBypassDeclarations() const { return m_CanBypassDeclarations; }
+    /// Each label with the block that it begins, in the order of first mention; a label without a
+    /// goto is there as well.
+    const std::vector<std::pair<const Statement*, std::int32_t>>& getLabels() const {
+        return m_LabelOrder;
+    }
 
 private:
     enum class TaskKind : std::uint8_t {
@@ -128,6 +136,7 @@ private:
     const Procedure* m_pProcedure = nullptr;
     std::vector<SketchBlock> m_Blocks;
     std::vector<Action> m_Actions;
+    std::vector<std::pair<const Statement*, std::int32_t>> m_LabelOrder;
     bool m_CanBypassDeclarations = false;
 
     // Valid while drawing.

@@ -40,6 +40,7 @@ void GraphBuilder::build() {
     markOutsideVariables(Reachable, Touched);
     markErasable(Touched);
     flagCalls(Reachable);
+    m_Target.m_OutsideReachable = Reachable;
 }
 
 // Step 1
@@ -72,6 +73,7 @@ void GraphBuilder::buildProcedure(const Procedure& Source) {
     Sketch.draw(Source);
     makeBlocks(Sketch);
     linkBlocks(Sketch);
+    noteLabels(Source, Sketch);
     buildPrologue(Source, Sketch.canBypassDeclarations());
     for (const Action& Next : Sketch.getActions()) {
         if (m_Blocks[Next.Block] != nullptr)
@@ -118,6 +120,14 @@ void GraphBuilder::linkBlocks(const FlowSketch& Sketch) {
         link(m_Nodes[i], Next, pFactory->createTrueBranch());
         link(m_Nodes[i], m_Nodes[static_cast<std::size_t>(Block.Otherwise)],
              pFactory->createFalseBranch());
+    }
+}
+
+void GraphBuilder::noteLabels(const Procedure& Source, const FlowSketch& Sketch) {
+    for (const auto& [pLabel, Block] : Sketch.getLabels()) {
+        if (m_Nodes[static_cast<std::size_t>(Block)] != nullptr)
+            m_Target.m_Labels.push_back(
+                {pLabel, &Source, m_Nodes[static_cast<std::size_t>(Block)]});
     }
 }
 

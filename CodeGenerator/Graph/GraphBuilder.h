@@ -28,6 +28,7 @@ private:
     void buildProcedure(const Procedure& Source);
     void makeBlocks(const FlowSketch& Sketch);
     void linkBlocks(const FlowSketch& Sketch);
+    void noteLabels(const Procedure& Source, const FlowSketch& Sketch);
     void buildPrologue(const Procedure& Source, bool ZeroesLocals);
     ZfCCfgExpression* makeCondition(const SketchBlock& Block);
     ZfCBasicBlock* newBlock(leda::node& Node);

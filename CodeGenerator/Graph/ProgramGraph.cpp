@@ -4,6 +4,8 @@
 #include "ZfCCfgExternCall.h"
 #include "ZfCCfgProcedure.h"
 
+#include <utility>
+
 namespace hpn {
 
 ProgramGraph::ProgramGraph(const Program& Source) : m_Source(Source), m_Hidden(Source) {
@@ -43,6 +45,15 @@ const Procedure* ProgramGraph::findProcedure(const char* Name) const {
         return m_Source.pMain;
     const auto Found = m_Procedures.find(Wanted);
     return Found != m_Procedures.end() ? Found->second : nullptr;
+}
+
+void ProgramGraph::noteExtracted(const std::string& ProcedureName, std::string ReadableName) {
+    m_Extracted[ProcedureName] = std::move(ReadableName);
+}
+
+const std::string& ProgramGraph::readableNameOf(const std::string& ProcedureName) const {
+    const auto Found = m_Extracted.find(ProcedureName);
+    return Found != m_Extracted.end() ? Found->second : ProcedureName;
 }
 
 void ProgramGraph::appendCalls() {

@@ -10,6 +10,7 @@
 
 #include <deque>
 #include <memory>
+#include <string>
 #include <string_view>
 #include <unordered_map>
 #include <unordered_set>
@@ -19,6 +20,19 @@ class ZfCCfgExternCall;
 class ZfCCfgProcedure;
 
 namespace hpn {
+
+/// A label of the program that control reaches, and the node that it begins.
+struct LabelPlace {
+    const Statement* pLabel;
+    const Procedure* pOwner;
+    leda::node Node;
+};
+
+/// Something about the program that is worth knowing and no mistake.
+struct Remark {
+    SourcePosition Position;
+    std::string Text;
+};
 
 /// One run of the optimiser on one program: boots the library, owns the graph, the client's
 /// variables and the terms, and takes all of it down again in the right order (graph, variables,
@@ -50,6 +64,20 @@ public:
     /// The source procedure behind a procedure's name on the graph ("#main" for main), or null
     /// (outside, extracted ones).
     const Procedure* findProcedure(const char* Name) const;
+    /// The labels as the program was built, in the order of first mention; edits of the graph do
+    /// not change them.
+    const std::vector<LabelPlace>& getLabels() const { return m_Labels; }
+    /// The procedure is exported, or an exported one calls it directly or indirectly.
+    bool isReachableFromOutside(const Procedure& Asked) const {
+        return m_OutsideReachable[Asked.Index];
+    }
+    /// Notes a procedure that extraction made, under a name that says where its code comes from.
+    void noteExtracted(const std::string& ProcedureName, std::string ReadableName);
+    std::size_t countExtracted() const { return m_Extracted.size(); }
+    /// The readable name of an extracted procedure; any other name is given back.
+    const std::string& readableNameOf(const std::string& ProcedureName) const;
+    /// What the passes remarked about the program so far, for the user.
+    std::vector<Remark>& getRemarks() { return m_Remarks; }
     /// Registers every call on the graph at its callee (for a road without `inlineProcedures`,
     /// which does it itself).
     void appendCalls();
@@ -66,6 +94,10 @@ private:
     TermArena m_Terms;
     std::unordered_map<const ZfCCfgExternCall*, const Extern*> m_Externs;
     std::unordered_set<const ZfCCfgExpression*> m_NeverLeft;
+    std::vector<LabelPlace> m_Labels;
+    std::vector<bool> m_OutsideReachable;                     // by Procedure::Index
+    std::unordered_map<std::string, std::string> m_Extracted; // readable names; looked up only
+    std::vector<Remark> m_Remarks;
 };
 
 } // namespace hpn

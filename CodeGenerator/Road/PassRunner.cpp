@@ -34,7 +34,7 @@ void PassRunner::runPass(PassStep& Step, bool IsAppendCallsWanted) {
     const auto Start = std::chrono::steady_clock::now();
     if (IsAppendCallsWanted)
         m_Graph.appendCalls();
-    Step.pPass->pRun(m_Graph.getGraph());
+    Step.pPass->pRun(m_Graph);
     Step.Seconds = std::chrono::duration<double>(std::chrono::steady_clock::now() - Start).count();
     for (PassObserver* pObserver : m_Observers)
         pObserver->afterPass(Step, m_Graph);

@@ -1,7 +1,8 @@
 #include "Road/PassSequence.h"
 
+#include "Graph/LabelExtraction.h"
+#include "Graph/ProgramGraph.h"
 #include "Model/HoistingContext.h"
-#include "ZfCControlFlowGraph.h"
 
 #include <algorithm>
 #include <cctype>
@@ -33,6 +34,10 @@ const char* const TwinIsGone =
 
 // Reported is the first rule broken, in this order, by the first pass that breaks one.
 const OrderRule OrderRules[] = {
+    {Id::MakeProcedureAndCall, CannotFollow, Id::PlaceExitNodes,
+     "a call that takes the place of a jump ends its procedure, which has its exit by then"},
+    {Id::MakeProcedureAndCall, CannotFollow, Id::MakeProcedureAndCall,
+     "every label that can be has been made a procedure"},
     {Id::PlaceExitNodes, CannotFollow, Id::PlaceExitNodes, "a procedure has one exit node"},
     {Id::InlineProcedures, CannotFollow, Id::TransformToSSAForm, VersionsAreFixed},
     {Id::InlineProcedures, Needs, Id::PlaceExitNodes,
@@ -105,9 +110,9 @@ const OrderRule* findBrokenRule(const std::vector<PassId>& Ids, std::size_t Plac
 }
 
 // The client's statements find their places in the graph through the context.
-void hoistCode(ZfCControlFlowGraph& Graph) {
-    const HoistingContext Context(Graph);
-    Graph.hoistCodeOutOfIfElseBranches();
+void hoistCode(ProgramGraph& Program) {
+    const HoistingContext Context(Program.getGraph());
+    Program.getGraph().hoistCodeOutOfIfElseBranches();
 }
 
 std::string_view trim(std::string_view Text) {
@@ -141,34 +146,39 @@ std::string describeUnknown(std::string_view Name) {
 } // namespace
 
 const std::array<Pass, PassCount>& passTable() {
-    using Graph = ZfCControlFlowGraph;
+    using Graph = ProgramGraph;
     static const std::array<Pass, PassCount> Table = {{
+        {Id::MakeProcedureAndCall, "makeProcedureAndCall",
+         "makes procedures of shared labels (with --extract-labels)",
+         [](Graph& G) { LabelExtraction(G).run(); }},
         {Id::PlaceExitNodes, "placeExitNodes", "gives each procedure one exit node",
-         [](Graph& G) { G.placeExitNodes(); }},
+         [](Graph& G) { G.getGraph().placeExitNodes(); }},
         {Id::InlineProcedures, "inlineProcedures",
-         "dissolves each procedure that has a single call", [](Graph& G) { G.inlineProcedures(); }},
+         "dissolves each procedure that has a single call",
+         [](Graph& G) { G.getGraph().inlineProcedures(); }},
         {Id::PlaceLoopAroundMain, "placeLoopAroundMain", "closes main into a loop, step after step",
-         [](Graph& G) { G.placeLoopAroundMain(); }},
+         [](Graph& G) { G.getGraph().placeLoopAroundMain(); }},
         {Id::InsertValidConditionAssignments, "insertValidConditionAssignments",
          "notes what a branch tells about its variable",
-         [](Graph& G) { G.insertValidConditionAssignments(); }},
+         [](Graph& G) { G.getGraph().insertValidConditionAssignments(); }},
         {Id::TransformToSSAForm, "transformToSSAForm",
          "gives each definition a version of its variable",
-         [](Graph& G) { G.transformToSSAForm(); }},
+         [](Graph& G) { G.getGraph().transformToSSAForm(); }},
         {Id::DivideBasicBlock, "divideBasicBlock", "leaves one statement or condition in each node",
-         [](Graph& G) { G.divideBasicBlock(); }},
+         [](Graph& G) { G.getGraph().divideBasicBlock(); }},
         {Id::PropagateSparseConditionalConstant, "propagateSparseConditionalConstant",
          "finds constants and ranges, removes what is never reached",
-         [](Graph& G) { G.propagateSparseConditionalConstant(true); }},
+         [](Graph& G) { G.getGraph().propagateSparseConditionalConstant(true); }},
         {Id::ReplaceConstantConditions, "replaceConstantConditions",
          "writes constant conditions into the code",
-         [](Graph& G) { G.replaceConstantConditions(); }},
+         [](Graph& G) { G.getGraph().replaceConstantConditions(); }},
         {Id::ReplaceConstantVariables, "replaceConstantVariables",
-         "writes constants in place of variables", [](Graph& G) { G.replaceConstantVariables(); }},
+         "writes constants in place of variables",
+         [](Graph& G) { G.getGraph().replaceConstantVariables(); }},
         {Id::FoldConstants, "foldConstants", "computes what has become constant",
-         [](Graph& G) { G.foldConstants(); }},
+         [](Graph& G) { G.getGraph().foldConstants(); }},
         {Id::RemoveUnusedVarDefs, "removeUnusedVarDefs", "removes definitions that nobody uses",
-         [](Graph& G) { G.removeUnusedVarDefs(); }},
+         [](Graph& G) { G.getGraph().removeUnusedVarDefs(); }},
         {Id::HoistCodeOutOfIfElseBranches, "hoistCodeOutOfIfElseBranches",
          "moves equal code of both arms in front of the branch", &hoistCode},
     }};
@@ -182,8 +192,14 @@ const Pass& passOf(PassId Id) {
 PassSequence PassSequence::defaultOrder() {
     PassSequence Result;
     for (const Pass& Each : passTable())
-        Result.m_Passes.push_back(Each.Id);
+        if (Each.Id != PassId::MakeProcedureAndCall)
+            Result.m_Passes.push_back(Each.Id);
     return Result;
+}
+
+void PassSequence::extractLabelsFirst() {
+    if (!contains(PassId::MakeProcedureAndCall))
+        m_Passes.insert(m_Passes.begin(), PassId::MakeProcedureAndCall);
 }
 
 bool PassSequence::make(const std::vector<PassId>& Ids, PassSequence& Result,

@@ -7,12 +7,14 @@
 #include <string_view>
 #include <vector>
 
-class ZfCControlFlowGraph;
-
 namespace hpn {
 
-/// The passes of the road, in the order in which they usually run.
+class ProgramGraph;
+
+/// The passes of the road, in the order in which they usually run. The first one only runs where it
+/// is asked for.
 enum class PassId : unsigned char {
+    MakeProcedureAndCall,
     PlaceExitNodes,
     InlineProcedures,
     PlaceLoopAroundMain,
@@ -26,7 +28,7 @@ enum class PassId : unsigned char {
     RemoveUnusedVarDefs,
     HoistCodeOutOfIfElseBranches
 };
-constexpr std::size_t PassCount = 12;
+constexpr std::size_t PassCount = 13;
 
 /// What is known of one pass: the name under which the user asks for it, one line for the help, and
 /// the operation of the graph.
@@ -34,7 +36,7 @@ struct Pass {
     PassId Id;
     const char* Name;
     const char* Purpose;
-    void (*pRun)(ZfCControlFlowGraph&);
+    void (*pRun)(ProgramGraph&);
 };
 
 /// All passes, by PassId.
@@ -62,7 +64,7 @@ class PassSequence {
 public:
     /// No pass at all: the code is emitted as it was built.
     PassSequence() = default;
-    /// The whole road.
+    /// The whole road, without the extraction of labels.
     static PassSequence defaultOrder();
     /// Reads names separated by commas (blanks around them do not count; an empty text is no pass).
     /// False leaves `Result` alone and writes one sentence, without a full stop, that says what is
@@ -70,6 +72,9 @@ public:
     static bool parse(std::string_view List, PassSequence& Result, std::string& Message);
     /// The same for passes that are there already.
     static bool make(const std::vector<PassId>& Ids, PassSequence& Result, std::string& Message);
+
+    /// Puts the extraction of labels in front, if it is not there yet; no rule stands against it.
+    void extractLabelsFirst();
 
     const std::vector<PassId>& getPasses() const { return m_Passes; }
     bool contains(PassId Id) const;

@@ -1,6 +1,8 @@
 #include "Road/Statistics.h"
 
 #include "Graph/ProgramGraph.h"
+#include "Model/ZfCCfgSFExpression.h"
+#include "Model/ZfCCfgSFProcedureCall.h"
 
 #include <cstring>
 
@@ -108,11 +110,48 @@ void countDefinitions(ZfCCfgStatement* pStatement, GraphCounts& Counts) {
     }
 }
 
+void countTerms(ZfCCfgExpression* pExpression, GraphCounts& Counts) {
+    if (pExpression == nullptr || pExpression->isSFExpression() == nullptr)
+        return;
+    std::vector<const Term*> Stack{pExpression->isSFExpression()->getRoot()};
+    while (!Stack.empty()) {
+        const Term* pTerm = Stack.back();
+        Stack.pop_back();
+        Counts.Reads += pTerm->Op == Operator::Variable ? 1 : 0;
+        Counts.Operations += pTerm->Op != Operator::Variable && pTerm->Op != Operator::Number;
+        for (const Term* pOperand : {pTerm->pLeft, pTerm->pRight})
+            if (pOperand != nullptr)
+                Stack.push_back(pOperand);
+    }
+}
+
+void countExpressions(ZfCCfgStatement* pStatement, GraphCounts& Counts) {
+    if (ZfCCfgAssignment* pAssignment = pStatement->isAssignment())
+        countTerms(pAssignment->getRHS(), Counts);
+    ZfCCfgProcedureCall* pAnyCall = pStatement->isProcedureCall();
+    ZfCCfgSFProcedureCall* pCall = pAnyCall != nullptr ? pAnyCall->isSFProcedureCall() : nullptr;
+    if (pCall == nullptr)
+        return;
+    for (const ZfCCfgSFProcedureCall::Argument& Next : pCall->getArguments())
+        countTerms(Next.pExpression, Counts);
+}
+
+void countCondition(ZfCCfgExpression* pCondition, GraphCounts& Counts) {
+    countTerms(pCondition, Counts);
+    ZfCCfgSFExpression* pOwn = pCondition != nullptr ? pCondition->isSFExpression() : nullptr;
+    if (pOwn != nullptr && pOwn->getRoot()->Op == Operator::Number)
+        ++Counts.FixedConditions;
+}
+
 void countBlock(ProgramGraph& Graph, leda::node v, ZfCBasicBlock* pBlock, GraphCounts& Counts) {
-    for (ZfCPhiFunction* pPhi : pBlock->getPhiFunctions())
+    for (ZfCPhiFunction* pPhi : pBlock->getPhiFunctions()) {
         countDefinitions(pPhi, Counts);
+        ++Counts.PhiFunctions;
+    }
+    countCondition(pBlock->getBranchCond(), Counts);
     for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq()) {
         countDefinitions(pStatement, Counts);
+        countExpressions(pStatement, Counts);
         ZfCCfgAssignment* pAssignment = pStatement->isAssignment();
         if (pAssignment != nullptr && pAssignment->getIsValidConditionAssignment())
             ++Counts.Notes;
@@ -129,30 +168,55 @@ std::size_t difference(std::size_t Before, std::size_t After) {
     return Before > After ? Before - After : 0;
 }
 
+// What one pass did, in one figure. `Total` is where the figure goes besides, or null.
+struct Effect {
+    PassId Id;
+    const char* What;
+    std::size_t GraphCounts::*pCount;
+    bool IsGain; ///< the pass makes more of what is counted; else it makes less
+    std::size_t Statistics::*pTotal;
+};
+
+const Effect Effects[] = {
+    {PassId::MakeProcedureAndCall, "procedures extracted", &GraphCounts::Procedures, true,
+     &Statistics::ProceduresExtracted},
+    {PassId::PlaceExitNodes, "exit nodes placed", &GraphCounts::Nodes, true, nullptr},
+    {PassId::InlineProcedures, "procedures inlined", &GraphCounts::Procedures, false,
+     &Statistics::ProceduresInlined},
+    {PassId::PlaceLoopAroundMain, "loop closed", &GraphCounts::Nodes, true, nullptr},
+    {PassId::InsertValidConditionAssignments, "condition assignments made", &GraphCounts::Notes,
+     true, &Statistics::ConditionAssignments},
+    {PassId::TransformToSSAForm, "phi functions placed", &GraphCounts::PhiFunctions, true, nullptr},
+    {PassId::DivideBasicBlock, "nodes gained", &GraphCounts::Nodes, true, nullptr},
+    {PassId::PropagateSparseConditionalConstant, "dead nodes removed", &GraphCounts::Nodes, false,
+     &Statistics::DeadNodesRemoved},
+    {PassId::ReplaceConstantConditions, "conditions decided", &GraphCounts::FixedConditions, true,
+     nullptr},
+    {PassId::ReplaceConstantVariables, "reads replaced by constants", &GraphCounts::Reads, false,
+     nullptr},
+    {PassId::FoldConstants, "operations computed", &GraphCounts::Operations, false, nullptr},
+    {PassId::RemoveUnusedVarDefs, "unused definitions removed", &GraphCounts::Definitions, false,
+     &Statistics::UnusedDefinitionsRemoved},
+    // One of two equal statements goes for each that is moved.
+    {PassId::HoistCodeOutOfIfElseBranches, "statements hoisted", &GraphCounts::Statements, false,
+     &Statistics::StatementsHoisted},
+};
+
 // What a pass did, from the counts before and after it.
-void noteEffect(PassId Id, const GraphCounts& Before, const GraphCounts& After,
+void noteEffect(Statistics::Record& Record, PassId Id, const GraphCounts& Before,
                 Statistics& Result) {
-    switch (Id) {
-    case PassId::InlineProcedures:
-        Result.ProceduresInlined += difference(Before.Procedures, After.Procedures);
-        return;
-    case PassId::InsertValidConditionAssignments:
-        Result.ConditionAssignments += difference(After.Notes, Before.Notes);
-        return;
-    case PassId::PropagateSparseConditionalConstant:
-        Result.ConstantsFound = After.ConstantVersions;
-        Result.DeadNodesRemoved += difference(Before.Nodes, After.Nodes);
-        return;
-    case PassId::RemoveUnusedVarDefs:
-        Result.UnusedDefinitionsRemoved += difference(Before.Definitions, After.Definitions);
-        return;
-    case PassId::HoistCodeOutOfIfElseBranches:
-        // One of two equal statements goes for each that is moved.
-        Result.StatementsHoisted += difference(Before.Statements, After.Statements);
-        return;
-    default:
-        return;
+    for (const Effect& Each : Effects) {
+        if (Each.Id != Id)
+            continue;
+        const std::size_t Old = Before.*Each.pCount;
+        const std::size_t New = Record.After.*Each.pCount;
+        Record.What = Each.What;
+        Record.Figure = Each.IsGain ? difference(New, Old) : difference(Old, New);
+        if (Each.pTotal != nullptr)
+            Result.*Each.pTotal += Record.Figure;
     }
+    if (Id == PassId::PropagateSparseConditionalConstant)
+        Result.ConstantsFound = Record.After.ConstantVersions;
 }
 
 // The block of the loop around main: the only condition of main that is neither the client's nor a
@@ -219,7 +283,8 @@ void StatisticsObserver::beforeAll(ProgramGraph& Graph) {
     m_Statistics.Before = m_Statistics.After = countGraph(Graph);
     for (const Procedure& Each : Graph.getProgram().Procedures) {
         m_Statistics.RecursiveProcedures += Each.IsRecursive ? 1 : 0;
-        m_Statistics.ExportedProcedures += Each.IsExported ? 1 : 0;
+        m_Statistics.ExportedProcedures +=
+            Graph.isReachableFromOutside(Each) && !Each.IsRecursive ? 1 : 0;
     }
 }
 
@@ -234,8 +299,8 @@ void StatisticsObserver::afterPass(const PassStep& Step, ProgramGraph& Graph) {
     m_pProbe.reset();
     const GraphCounts Before = m_Statistics.After;
     m_Statistics.After = countGraph(Graph);
-    m_Statistics.Passes.push_back({Step.pPass->Name, Step.Seconds, m_Statistics.After});
-    noteEffect(Step.pPass->Id, Before, m_Statistics.After, m_Statistics);
+    m_Statistics.Passes.push_back({Step.pPass->Name, Step.Seconds, m_Statistics.After, 0, ""});
+    noteEffect(m_Statistics.Passes.back(), Step.pPass->Id, Before, m_Statistics);
 }
 
 } // namespace hpn

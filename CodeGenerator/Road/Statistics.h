@@ -25,6 +25,10 @@ struct GraphCounts {
     std::size_t Notes = 0;       ///< assignments that note what a branch tells
     std::size_t ConstantVersions =
         0; ///< SSA versions, defined on the graph, whose value is constant
+    std::size_t PhiFunctions = 0;
+    std::size_t Reads = 0;           ///< of variables, in the client's expressions
+    std::size_t Operations = 0;      ///< operators and conversions in them
+    std::size_t FixedConditions = 0; ///< branch conditions that are a number
 };
 
 /// Counts by walking the graph once; linear.
@@ -36,6 +40,8 @@ struct Statistics {
         const char* PassName;
         double Seconds;
         GraphCounts After;
+        std::size_t Figure; ///< what the pass did, counted
+        const char* What;   ///< in words, of the figure
     };
 
     GraphCounts Before;
@@ -45,11 +51,13 @@ struct Statistics {
     std::size_t DeadNodesRemoved = 0; ///< nodes that no execution reaches
     std::size_t Iterations = 0;       ///< sweeps of all propagations together
     std::size_t UnusedDefinitionsRemoved = 0;
+    std::size_t ProceduresExtracted = 0; ///< made of labels
     std::size_t ProceduresInlined = 0;
     std::size_t ConditionAssignments = 0;
     std::size_t StatementsHoisted = 0;
     std::size_t RecursiveProcedures = 0; ///< kept out of inlining because they call themselves
-    std::size_t ExportedProcedures = 0;  ///< kept out because they can be called from outside
+    std::size_t ExportedProcedures =
+        0; ///< kept out because they can be called from outside, directly or indirectly
 };
 
 /// Gathers the statistics of a run. Costs a walk over the graph for each pass.

@@ -117,6 +117,8 @@ static inline int32_t hpn_sgn64(int64_t x) { return x < 0 ? -1 : x > 0 ? 1 : 0; 
 /* The remainder has the sign of a; zero divisors give 0. */
 static inline int32_t hpn_mod(int32_t a, int32_t b) { return b == 0 || b == -1 ? 0 : a % b; }
 
+/* The number itself, where a plain expression would look like a slip to compilers. */
+static inline int32_t hpn_value32(int32_t x) { return x; }
 static inline int32_t hpn_not(int32_t x) { return -1 - x; }
 
 /* Only the low five bits of a shift count matter; a shift to the right copies the sign bit in. */

@@ -12,12 +12,10 @@ using namespace hpn;
 
 std::string emitted(const std::string& Text, const PassSequence& Passes = PassSequence(),
                     const std::string& Prefix = "") {
-    SourceFiles Sources;
-    Sources.add("test.hpn", Text);
-    Diagnostics Messages(Sources);
-    Program Source;
-    EXPECT_TRUE(readProgram(Sources, Messages, Source)) << Messages.print();
-    return ProgramComparison::emit(Source, Prefix, Passes);
+    const ReadText Read(Text);
+    if (!Read.program())
+        return Read.messages();
+    return ProgramComparison::emit(*Read.program(), Prefix, Passes);
 }
 
 std::string optimised(const std::string& Text) {
@@ -74,6 +72,10 @@ TEST(Emitter, StatementsReadLikeTheSource) {
         {"type S = uint8 range [0, 100] saturate; output S y; input int16 a; proc main() { y = a * "
          "2; }",
          "    y = hpn_clip32(a * 2, 0, 100);\n"},
+        // Tests that only ask on behalf of another one are joined.
+        {"input uint8 a; input bool b; output bool y; proc main() { if (a == 1) { if (!b) { y = 1; "
+         "} } }",
+         "    if (a == 1 && !b) {\n        y = true;\n    }\n"},
         // An input is read even where nothing comes of it.
         {"input bool a; proc main() { if (a) { } }", "    (void)a;\n"},
         {"output uint8 y; proc main() { if (true) { y = 1; } else { y = 2; } }", "    y = 1;\n"},
@@ -143,7 +145,7 @@ TEST(Emitter, StructuredSourceNeedsNoGoto) {
         "  local uint8 i = 0;\n"
         "  while (i < 8) { i++; if (a == i) { continue; } if (a > 200) { break; } y += i; }\n"
         "  do { z++; } while (z < a);\n"
-        "  switch (a) { case 1: y = 1; break; case 2: z = 2; break; default: y = 3; }\n"
+        "  switch (a) { case 1: y = 1; break; case 4: case 2: z = 2; break; default: y = 3; }\n"
         "  if (a == 1) { y = 5; } else if (a == 2) { y = 6; } else { y = 7; }\n"
         "}\n";
     for (const std::string& Text : {emitted(pSource), optimised(pSource)}) {

@@ -2,6 +2,7 @@
 // calls.
 
 #include "GraphRandomProgram.h"
+#include "GraphShape.h"
 #include "Model/HoistingContext.h"
 
 #include <gtest/gtest.h>
@@ -12,66 +13,6 @@ namespace {
 
 using namespace hpn;
 using namespace hpn::test;
-
-/// Nodes that a walk along or against the edges reaches.
-std::set<int> reachedFrom(ZfCControlFlowGraph& Graph, std::vector<leda::node> Stack, bool Forward) {
-    std::set<int> Reached;
-    while (!Stack.empty()) {
-        const leda::node v = Stack.back();
-        Stack.pop_back();
-        if (!Reached.insert(Graph.index(v)).second)
-            continue;
-        for (leda::edge e : Forward ? Graph.out_edges(v) : Graph.in_edges(v))
-            Stack.push_back(Forward ? Graph.target(e) : Graph.source(e));
-    }
-    return Reached;
-}
-
-void checkWaysOut(ZfCControlFlowGraph& Graph, leda::node v, ZfCBasicBlock* pBlock) {
-    int True = 0;
-    int False = 0;
-    for (leda::edge e : Graph.out_edges(v)) {
-        True += Graph[e]->isTrueBranch() != nullptr ? 1 : 0;
-        False += Graph[e]->isFalseBranch() != nullptr ? 1 : 0;
-    }
-    const int Wanted = pBlock->getBranchCond() != nullptr ? 1 : 0;
-    EXPECT_EQ(True, Wanted);
-    EXPECT_EQ(False, Wanted);
-    EXPECT_LE(Graph.outdeg(v), 1 + Wanted);
-}
-
-/// All that later passes rely on. Every block has a way out of its procedure, even where a loop has
-/// none.
-void checkShape(ProgramGraph& Program) {
-    ZfCControlFlowGraph& Graph = Program.getGraph();
-    EXPECT_TRUE(Graph.checkConsistency());
-    std::vector<leda::node> Ends;
-    std::vector<leda::node> Entries;
-    for (leda::node v : Graph.all_nodes()) {
-        ASSERT_NE(Graph[v]->getProcedure(), nullptr);
-        for (leda::edge e : Graph.out_edges(v))
-            EXPECT_EQ(Graph[Graph.target(e)]->getProcedure(), Graph[v]->getProcedure());
-        if (Graph.outdeg(v) == 0)
-            Ends.push_back(v);
-        ZfCBasicBlock* pBlock = Graph[v]->isBasicBlock();
-        EXPECT_EQ(Graph.indeg(v) == 0, pBlock == nullptr);
-        if (pBlock == nullptr) {
-            Entries.push_back(v);
-            EXPECT_EQ(Graph.outdeg(v), 1);
-            EXPECT_EQ(Graph[v]->getProcedure()->getEntryNode(), v);
-            continue;
-        }
-        checkWaysOut(Graph, v, pBlock);
-        for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq()) {
-            if (pStatement->isProcedureCall() != nullptr) {
-                EXPECT_TRUE(pBlock->isStatement() == pStatement && Graph.outdeg(v) <= 1);
-            }
-        }
-    }
-    const auto Count = static_cast<std::size_t>(Graph.number_of_nodes());
-    EXPECT_EQ(reachedFrom(Graph, Entries, true).size(), Count);
-    EXPECT_EQ(reachedFrom(Graph, Ends, false).size(), Count);
-}
 
 /// Statements of the graph that define a variable.
 int countDefinitions(ProgramGraph& Program, const Variable& Of) {

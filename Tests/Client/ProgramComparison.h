@@ -15,6 +15,25 @@
 #include <sstream>
 #include <string>
 
+/// One program text, read. Keeps the sources, into which the program points.
+class ReadText {
+public:
+    explicit ReadText(const std::string& Text) : m_Messages(m_Sources) {
+        m_Sources.add("test.hpn", Text);
+        m_IsRead = hpn::readProgram(m_Sources, m_Messages, m_Program);
+    }
+
+    /// Null if it is not accepted.
+    const hpn::Program* program() const { return m_IsRead ? &m_Program : nullptr; }
+    std::string messages() const { return m_Messages.print(); }
+
+private:
+    hpn::SourceFiles m_Sources;
+    hpn::Diagnostics m_Messages;
+    hpn::Program m_Program;
+    bool m_IsRead = false;
+};
+
 /// Builds one C program out of many control programs, each in two variants: as it was built and
 /// after the given passes. It drives both with the same inputs, lets externs write the same values,
 /// calls exported procedures with the same arguments, and tells the first step in which an output,
@@ -23,23 +42,25 @@ class ProgramComparison {
 public:
     /// False, with messages, if the text is not accepted.
     bool add(const std::string& Text, const hpn::PassSequence& Passes, std::string& Messages) {
-        hpn::SourceFiles Sources;
-        Sources.add("test.hpn", Text);
-        hpn::Diagnostics Mistakes(Sources);
-        hpn::Program Source;
-        if (!hpn::readProgram(Sources, Mistakes, Source)) {
-            Messages = Mistakes.print();
+        const ReadText Read(Text);
+        Messages = Read.messages();
+        if (!Read.program())
             return false;
-        }
+        const hpn::Program& Source = *Read.program();
         const std::string Stem = "p" + std::to_string(m_Count++);
-        m_Programs << emit(Source, Stem + "a_", hpn::PassSequence())
-                   << emit(Source, Stem + "b_", Passes);
+        const std::string Before = emit(Source, Stem + "a_", hpn::PassSequence());
+        const std::string After = emit(Source, Stem + "b_", Passes);
+        m_Shortened += After.size() < Before.size();
+        m_Programs << Before << After;
         writeExterns(Source, Stem, 'a');
         writeExterns(Source, Stem, 'b');
         writeRun(Source, Stem);
         m_Calls << "    failures += run_" << Stem << "();\n";
         return true;
     }
+
+    /// Programs that the passes have made shorter.
+    unsigned countShortened() const { return m_Shortened; }
 
     std::string text(int Steps) const {
         return "#include <stdio.h>\n#include <string.h>\n" + m_Programs.str() + head(Steps) +
@@ -206,6 +227,7 @@ static int differs(const char *what, int step, uint64_t a, uint64_t b) {
     }
 
     int m_Count = 0;
+    unsigned m_Shortened = 0;
     std::ostringstream m_Programs;
     std::ostringstream m_Drivers;
     std::ostringstream m_Calls;

@@ -36,7 +36,10 @@ TEST(RoadPassSequence, RefusesWhatBreaksAPreconditionAndSaysWhichOne) {
         {"inlineProcedures", "inlineProcedures needs placeExitNodes before it: "},
         {"insertValidConditionAssignments", "insertValidConditionAssignments needs placeExitNodes"},
         {"transformToSSAForm", "transformToSSAForm needs placeExitNodes before it: "},
+        {"placeExitNodes,makeProcedureAndCall",
+         "makeProcedureAndCall cannot follow placeExitNodes: "},
         // Once only.
+        {"makeProcedureAndCall,makeProcedureAndCall", "makeProcedureAndCall cannot run twice: "},
         {"placeExitNodes,placeExitNodes", "placeExitNodes cannot run twice: "},
         {"placeExitNodes,inlineProcedures,inlineProcedures", "inlineProcedures cannot run twice: "},
         {std::string(Frame) + ",transformToSSAForm", "transformToSSAForm cannot run twice: "},
@@ -71,7 +74,7 @@ TEST(RoadPassSequence, RefusesWhatBreaksAPreconditionAndSaysWhichOne) {
         // Names.
         {"placeExitNodes,,divideBasicBlock", "an empty name stands in the list"},
         {"placeExitNodes,", "an empty name stands in the list"},
-        {"placeexitnodes", "unknown pass 'placeexitnodes'; the passes are placeExitNodes, "},
+        {"placeexitnodes", "unknown pass 'placeexitnodes'; the passes are makeProcedureAndCall, "},
     };
     for (const Case& Each : Cases)
         EXPECT_EQ(refusalOf(Each.List).rfind(Each.Beginning, 0), 0u)
@@ -83,7 +86,12 @@ TEST(RoadPassSequence, AcceptsTheRoadAndItsVariations) {
     std::string Message;
     ASSERT_TRUE(PassSequence::parse(namesOf(PassSequence::defaultOrder()), Result, Message));
     EXPECT_EQ(Result.getPasses(), PassSequence::defaultOrder().getPasses());
+    // The whole road but for the extraction, which is asked for.
+    EXPECT_EQ(Result.getPasses().size(), hpn::PassCount - 1);
+    Result.extractLabelsFirst();
+    Result.extractLabelsFirst();
     EXPECT_EQ(Result.getPasses().size(), hpn::PassCount);
+    EXPECT_EQ(refusalOf(namesOf(Result)), "");
 
     EXPECT_EQ(refusalOf("  "), "");
     EXPECT_EQ(refusalOf(" placeExitNodes , inlineProcedures "), "");
@@ -101,12 +109,13 @@ TEST(RoadPassSequence, RefusedListLeavesTheSequenceAlone) {
     PassSequence Result = PassSequence::defaultOrder();
     std::string Message;
     EXPECT_FALSE(PassSequence::parse("placeExitNodes,nonsense", Result, Message));
-    EXPECT_EQ(Result.getPasses().size(), hpn::PassCount);
+    EXPECT_EQ(Result.getPasses().size(), hpn::PassCount - 1);
 }
 
 // By hand: nothing, or exit nodes with any of inlining, loop and notes (8); SSA form on top (8);
 // divided without the loop, with hoisting or not (8); divided with the loop (4 kinds of frame)
-// without propagation (4 of removal and hoisting) or with it (8 of application times 4).
+// without propagation (4 of removal and hoisting) or with it (8 of application times 4); all of
+// them with the extraction in front or not.
 TEST(RoadPassSequence, SubsetsOfTheRoadAreAllowedAsCountedByHand) {
     std::size_t Allowed = 0;
     for (unsigned Subset = 0; Subset < (1u << hpn::PassCount); ++Subset) {
@@ -118,7 +127,7 @@ TEST(RoadPassSequence, SubsetsOfTheRoadAreAllowedAsCountedByHand) {
         std::string Message;
         Allowed += PassSequence::make(Ids, Result, Message) ? 1 : 0;
     }
-    EXPECT_EQ(Allowed, 1u + 8u + 8u + 8u + 4u * (4u + 8u * 4u));
+    EXPECT_EQ(Allowed, 2u * (1u + 8u + 8u + 8u + 4u * (4u + 8u * 4u)));
 }
 
 } // namespace

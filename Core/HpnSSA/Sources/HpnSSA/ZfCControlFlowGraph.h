@@ -69,7 +69,7 @@ public:
     ZfCControlFlowGraph& operator=(ZfCControlFlowGraph const& Other);
 
     // Empties the factory of everything, whichever graph it belonged to.
-    virtual ~ZfCControlFlowGraph();
+    ~ZfCControlFlowGraph() override;
 
     // The entry node of "#main", as the client has set it; null until then.
     leda::node getStartNode();

@@ -26,7 +26,7 @@ public:
     ZfCDominatorTree(ZfCDominatorTree const& Other);
     ZfCDominatorTree& operator=(ZfCDominatorTree const& Other);
 
-    virtual ~ZfCDominatorTree();
+    ~ZfCDominatorTree() override;
 
     // The tree node of the procedure's entry; null until it is set.
     leda::node getRoot();
