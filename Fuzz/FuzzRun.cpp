@@ -31,7 +31,8 @@ constexpr unsigned BatchSize = 8;
 constexpr unsigned MostAttempts = 6000;
 constexpr double PatienceSeconds = 20.0;
 constexpr double AnswerSeconds = 5.0;
-constexpr double HangSeconds = 0.5; // a small program that takes longer hangs; asked where that is the failure looked for
+constexpr double HangSeconds =
+    0.5; // a small program that takes longer hangs; asked where that is the failure looked for
 
 const char* const Hang = "does not end";
 

@@ -29,7 +29,6 @@ public:
         : m_pFormerSink(ZfCPlatformMessageServer::setSink(this)) {
         s_First.clear();
         s_Kind.clear();
-        s_ToleratesSecondWayOut = false;
         m_pFormerHook = ZfCPlatformMessageServer::setAssertionHook(&hearAssertion);
         m_pFormerHandler = leda::std_error_handler;
         leda::std_error_handler = &hearLayer;
@@ -49,10 +48,6 @@ public:
         if (Severity == ERR_severity_fatal)
             hear("internal error", Text);
     }
-    /// Renaming reports it to developers when a second way into an exit node meets returned values
-    /// that the first one has renamed. It does no harm: all ways bring the same versions, or there
-    /// would be a block with phi functions in front of the exit.
-    void tolerateSecondWayOut(bool IsTolerated) { s_ToleratesSecondWayOut = IsTolerated; }
     const std::string& getKind() const { return s_Kind; }
     const std::string& getText() const { return s_First; }
 
@@ -66,8 +61,6 @@ private:
     static void hearAssertion(const char* File, int Line, const char* Condition) {
         const std::string_view Path = File;
         const std::string Name(Path.substr(Path.rfind('/') + 1));
-        if (s_ToleratesSecondWayOut && Name == "ZfCControlFlowGraphRenaming.cpp")
-            return;
         // Extraction stamps the block of a call that stands in for a conditional jump with the
         // procedure of the jump's target; the client stamps all blocks anew at the end, and
         // `checkConsistency` looks at that.
@@ -80,7 +73,6 @@ private:
 
     static std::string s_Kind;
     static std::string s_First;
-    static bool s_ToleratesSecondWayOut;
     ZfCMessageSink* m_pFormerSink;
     ZfCPlatformMessageServer::tAssertionHook m_pFormerHook = nullptr;
     void (*m_pFormerHandler)(int, const char*) = nullptr;
@@ -88,15 +80,6 @@ private:
 
 std::string Listener::s_Kind;
 std::string Listener::s_First;
-bool Listener::s_ToleratesSecondWayOut = false;
-
-bool hasSecondWayOut(ZfCControlFlowGraph& Graph) {
-    for (leda::node v = Graph.first_node(); v != nullptr; v = Graph.next_node(v)) {
-        if (Graph.inf(v)->isExitNode() != nullptr && Graph.indeg(v) > 1)
-            return true;
-    }
-    return false;
-}
 
 bool hasLostExit(ZfCControlFlowGraph& Graph) {
     for (leda::node v = Graph.first_node(); v != nullptr; v = Graph.next_node(v)) {
@@ -162,11 +145,8 @@ public:
     void beforePass(const PassStep& Step, ProgramGraph& Graph) override {
         m_Pass = Step.pPass->Name;
         m_NodesBefore = Graph.getGraph().number_of_nodes();
-        m_Ears.tolerateSecondWayOut(Step.pPass->Id == PassId::TransformToSSAForm &&
-                                    hasSecondWayOut(Graph.getGraph()));
     }
     void afterPass(const PassStep& Step, ProgramGraph& Graph) override {
-        m_Ears.tolerateSecondWayOut(false);
         ++m_Result.Counts.Passes[static_cast<std::size_t>(Step.pPass->Id)];
         note(Step.pPass->Id, Graph);
         tamper(Step.pPass->Name, Graph);

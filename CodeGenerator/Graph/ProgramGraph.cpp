@@ -72,4 +72,21 @@ void ProgramGraph::appendCalls() {
     }
 }
 
+void ProgramGraph::joinExits() {
+    ZfCControlFlowGraph& Graph = *m_pGraph;
+    ZfCCfgFactory* pFactory = ZfCCfgFactory::getInstance();
+    const leda::list<leda::node> Nodes = Graph.all_nodes();
+    for (leda::node Exit : Nodes) {
+        if (Graph.inf(Exit)->isExitNode() == nullptr || Graph.indeg(Exit) < 2)
+            continue;
+        ZfCBasicBlock* pLast = pFactory->createBasicBlock();
+        pLast->setProcedure(Graph.inf(Exit)->getProcedure());
+        leda::node Last = Graph.new_node(pLast);
+        const leda::list<leda::edge> InEdges = Graph.in_edges(Exit);
+        for (leda::edge e : InEdges)
+            Graph.move_edge(e, Graph.source(e), Last);
+        Graph.new_edge(Last, Exit, pFactory->createEdgeInfo());
+    }
+}
+
 } // namespace hpn

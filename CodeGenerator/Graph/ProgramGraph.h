@@ -81,6 +81,10 @@ public:
     /// Registers every call on the graph at its callee (for a road without `inlineProcedures`,
     /// which does it itself).
     void appendCalls();
+    /// Leads every procedure with several ways into its exit through one last block, so that what
+    /// it returns is current at one place when versions are made. For the moment right before SSA
+    /// form.
+    void joinExits();
 
 private:
     friend class GraphBuilder;

@@ -106,16 +106,25 @@ leda::set<ZfCCfgVariable*, leda::avl_tree> ZfCCfgSFExpression::getUsedVariables(
 
 void ZfCCfgSFExpression::replaceVariable(ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
     replaceRead(m_pRoot, pOld, pNew);
+    m_IsSettled = false;
 }
 
 void ZfCCfgSFExpression::replaceConditionWithConstant(double Number) {
     becomeNumber(m_pRoot, Number);
+    m_IsSettled = false;
 }
 
 ZfCCfgValue ZfCCfgSFExpression::evaluate() {
     if (isMarkedAsEvalToNonConst())
         return ZfCCfgValue(eCfgValueNonConstant);
-    return hpn::valueOfTerm(m_pRoot);
+    if (m_IsSettled)
+        return ZfCCfgValue(m_SettledNumber);
+    ZfCCfgValue Value = hpn::valueOfTerm(m_pRoot);
+    if (Value.isConstant()) {
+        m_IsSettled = true;
+        m_SettledNumber = Value.getValue();
+    }
+    return Value;
 }
 
 ZfCCfgValue ZfCCfgSFExpression::getMinimum() {
@@ -129,7 +138,8 @@ ZfCCfgValue ZfCCfgSFExpression::getMaximum() {
 ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
     if (isMarkedAsEvalToNonConst() || m_pRoot->Op == Operator::Element)
         return ZfCCfgValue(eCfgValueNonConstant);
-    const ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
+    const ZfCCfgValue Value =
+        m_IsSettled ? ZfCCfgValue(m_SettledNumber) : hpn::latticeValueOfTerm(m_pRoot);
     if (Value.isConstant())
         return std::isnan(Value.getValue()) ? ZfCCfgValue(eCfgValueNonConstant) : Value;
     const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);

@@ -41,6 +41,11 @@ private:
     ZfCCfgValue getEnd(bool IsMaximum);
 
     hpn::Term* m_pRoot;
+    /// It has evaluated to a constant, and stays at it: what propagation concludes holds for every
+    /// run, also where an operand's kind moves on and would hide it again. Without that, a value
+    /// could swing between constant and not for ever, each step up asking for another iteration.
+    bool m_IsSettled = false;
+    double m_SettledNumber = 0.0; ///< holds while m_IsSettled
 };
 
 #endif

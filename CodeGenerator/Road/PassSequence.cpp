@@ -163,7 +163,10 @@ const std::array<Pass, PassCount>& passTable() {
          [](Graph& G) { G.getGraph().insertValidConditionAssignments(); }},
         {Id::TransformToSSAForm, "transformToSSAForm",
          "gives each definition a version of its variable",
-         [](Graph& G) { G.getGraph().transformToSSAForm(); }},
+         [](Graph& G) {
+             G.joinExits();
+             G.getGraph().transformToSSAForm();
+         }},
         {Id::DivideBasicBlock, "divideBasicBlock", "leaves one statement or condition in each node",
          [](Graph& G) { G.getGraph().divideBasicBlock(); }},
         {Id::PropagateSparseConditionalConstant, "propagateSparseConditionalConstant",

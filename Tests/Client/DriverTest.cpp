@@ -2,6 +2,7 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <sstream>
 #include <vector>
 
@@ -156,6 +157,60 @@ TEST(Driver, ReportsGoBesideTheCodeAndNotIntoIt) {
     ASSERT_EQ(Run.run("small.hpn --stats=json -o out.c"), 0);
     EXPECT_EQ(Run.errors(), "");
     EXPECT_EQ(Run.output().rfind("{\n  \"program\": \"small\",\n  \"before\": {", 0), 0u);
+}
+
+TEST(Driver, ExtractionIsAskedForAndSaysWhatItLeaves) {
+    const char* const Jumps = "input uint8 key; output uint8 lamp = 0; output uint8 count = 0;\n"
+                              "proc main() {\n"
+                              "  if (key == 1) { lamp = 1; goto fault; }\n"
+                              "  if (key == 2) { goto fault; }\n"
+                              "again:\n"
+                              "  count = count + 1;\n"
+                              "  if (count < key) { goto again; }\n"
+                              "  return;\n"
+                              "fault:\n"
+                              "  lamp = lamp + 2;\n"
+                              "}\n";
+    DriverRun Run;
+    Run.write("jumps.hpn", Jumps);
+    ASSERT_EQ(Run.run("jumps.hpn --stats=json -o plain.c"), 0);
+    EXPECT_EQ(Run.errors(), "");
+    EXPECT_TRUE(contains(Run.output(), "\"proceduresExtracted\": 0"));
+    EXPECT_FALSE(contains(Run.read("plain.c"), "main_fault"));
+    ASSERT_EQ(Run.run("jumps.hpn --extract-labels --stats=json --dump-dot=d --dump-html=h -o x.c"),
+              0);
+    EXPECT_EQ(Run.errors().rfind("jumps.hpn:5:1: remark: label 'again' stays a label: the code "
+                                 "behind it jumps back to it",
+                                 0),
+              0u)
+        << Run.errors();
+    const std::string Remarks = Run.errors();
+    EXPECT_EQ(std::count(Remarks.begin(), Remarks.end(), '\n'), 1) << Remarks;
+    EXPECT_TRUE(contains(Run.output(), "\"proceduresExtracted\": 1"));
+    EXPECT_TRUE(contains(Run.read("x.c"), "static void main_fault(void)"));
+    EXPECT_EQ(Run.files("d").size(), 14u);
+    EXPECT_EQ(Run.files("h").count("01_makeProcedureAndCall_SF_1.html"), 1u);
+    // The road alone, the pass by its name, the option with a list, and with no pass at all.
+    ASSERT_EQ(Run.run("jumps.hpn --passes=makeProcedureAndCall"), 0);
+    const std::string Alone = Run.output();
+    EXPECT_TRUE(contains(Alone, "main_fault"));
+    for (const char* Same : {"--passes=\" \" --extract-labels", "--no-optimize --extract-labels",
+                             "--passes=makeProcedureAndCall --extract-labels"}) {
+        ASSERT_EQ(Run.run(std::string("jumps.hpn ") + Same), 0) << Same << Run.errors();
+        EXPECT_EQ(Run.output(), Alone) << Same;
+    }
+}
+
+TEST(Driver, ComparisonOfABooleanWithAnotherNumberIsWarnedOfWithItsPlace) {
+    DriverRun Run;
+    Run.write("flag.hpn", "input uint8 i; output uint8 o = 0; state bool b = false;\n"
+                          "proc main() {\n"
+                          "  b = i == 1;\n"
+                          "  if (b == 2) { o = 1; }\n"
+                          "}\n");
+    ASSERT_EQ(Run.run("flag.hpn -o flag.c"), 0);
+    EXPECT_EQ(Run.errors().rfind("flag.hpn:4:9: warning: a Boolean variable is compared", 0), 0u)
+        << Run.errors();
 }
 
 // Addresses differ from run to run by themselves; another environment, a fixed layout and another

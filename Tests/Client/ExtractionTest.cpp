@@ -189,8 +189,7 @@ TEST(Extraction, DeadBranchWithBothArmsToOneLabelLeavesTheOtherWaysIn) {
         "s = i; if (OFF) { s = 5; switch (k) { case 1: case 2: default: } } o = s;",
         "s = i; if (OFF) { s = 5; switch (k) { } while (k > 3) { } } o = s;",
         "s = i; if (OFF) { s = 5; for (; k > 3; ) { } do { } while (k > 7); } o = s;",
-        "s = i; if (OFF) { s = 5; while (true) { if (k == 3) { continue; } else { continue; } } } "
-        "o = s;",
+        "s = i; if (OFF) { while (true) { if (k == 3) { continue; } else { continue; } } } o = s;",
     };
     for (const char* Body : Bodies) {
         const std::string Text = std::string(Declarations) + "proc main() { " + Body + " }\n";

@@ -100,6 +100,8 @@ TEST(RoadStatistics, EveryPassShowsWhatItDid) {
     EXPECT_EQ(Counts.StatementsHoisted, 1u); // p = 3
     EXPECT_LT(Counts.After.Statements, Counts.Before.Statements);
     EXPECT_LT(Counts.After.Conditions, Counts.Before.Conditions);
+    for (const Statistics::Record& Each : Counts.Passes)
+        EXPECT_GE(Each.Figure, 1u) << Each.PassName << ": " << Each.What;
 }
 
 TEST(RoadStatistics, ProceduresKeptFromInliningAreNamedByCause) {
@@ -110,6 +112,17 @@ TEST(RoadStatistics, ProceduresKeptFromInliningAreNamedByCause) {
     EXPECT_EQ(Run.Counts.RecursiveProcedures, 1u);
     EXPECT_EQ(Run.Counts.ExportedProcedures, 1u);
     EXPECT_EQ(Run.Counts.ProceduresInlined, 0u);
+
+    // What an exported procedure calls is reachable from outside as well, and stays.
+    const WatchedRun Ring("output uint8 o = 0;\n"
+                          "proc main() { f(3); }\n"
+                          "proc f(uint8 n) { if (n > 0) { g(n - 1); } }\n"
+                          "proc g(uint8 n) { if (n > 0) { o = n; f(n - 1); } }\n"
+                          "export proc h() { k(); }\n"
+                          "proc k() { o = 7; }\n");
+    EXPECT_EQ(Ring.Counts.RecursiveProcedures, 2u);
+    EXPECT_EQ(Ring.Counts.ExportedProcedures, 2u);
+    EXPECT_EQ(Ring.Counts.ProceduresInlined, 0u);
 }
 
 // The program never comes round to the loop around main, so the probe's node goes as dead code.

@@ -28,13 +28,20 @@ const std::string Mark = "variant_";
 const char* const Head = R"c(#include <stdint.h>
 #include <stdio.h>
 #include <string.h>
-enum { Steps = 3000 };
+enum { Steps = 12000 };
 static uint64_t seen[Steps];
 static uint64_t random_state, hash;
 static int is_first = 1;
 static int64_t draw(int64_t low, int64_t high) {
     random_state = random_state * 6364136223846793005u + 1442695040888963407u;
     return low + (int64_t)((random_state >> 33) % ((uint64_t)(high - low) + 1u));
+}
+/* Mostly a small move, seldom a jump. */
+static int64_t vary(int64_t old, int64_t low, int64_t high) {
+    int64_t next = old + draw(-8, 8);
+    if (high - low < 64 || old < low || old > high || draw(0, 31) == 0)
+        return draw(low, high);
+    return next < low ? low : next > high ? high : next;
 }
 static void note(const void *at, size_t size) {
     for (const unsigned char *p = at; size-- > 0; ++p)
@@ -128,23 +135,25 @@ private:
         return "note(&" + Name + ", sizeof " + Name + ");\n";
     }
 
-    /// Inputs mostly move inside what is normal for them, and now and then become anything.
+    /// Inputs change often or hardly ever, by phases, so that timers can run out; in two phases of
+    /// three they stay inside what is normal for them, else they now and then become anything.
     std::string setInput(const Variable& Input) const {
         const BaseType Base = Input.pType->Base;
         const std::string Name = Mark + std::string(Input.Name);
         const auto Normal = NormalInputs.find(std::string(Input.Name));
         const long Low = isFloating(Base) ? -1000 : static_cast<long>(smallestRaw(Base));
         const long High = isFloating(Base) ? 1000 : static_cast<long>(greatestRaw(Base));
-        const auto drawn = [&](long a, long b) {
-            return "(" + std::string(cTypeName(Base)) + ")draw(" + std::to_string(a) + ", " +
+        const auto drawn = [&](const std::string& Call, long a, long b) {
+            return "(" + std::string(cTypeName(Base)) + ")" + Call + std::to_string(a) + ", " +
                    std::to_string(b) + ")";
         };
-        const std::string Wild = drawn(Low, High);
+        const std::string Wild = drawn("draw(", Low, High);
+        const std::string Vary = "vary((int64_t)" + Name + ", ";
         const std::string Usual = Normal != NormalInputs.end()
-                                      ? drawn(Normal->second.first, Normal->second.second)
-                                      : drawn(Low, std::min(High, 6L));
-        return "        if (draw(0, 7) == 0) " + Name + " = draw(0, 15) == 0 ? " + Wild + " : " +
-               Usual + ";\n";
+                                      ? drawn(Vary, Normal->second.first, Normal->second.second)
+                                      : drawn(Vary, Low, std::min(High, 6L));
+        return "        if (draw(0, rate) == 0) " + Name + " = wild && draw(0, 3) == 0 ? " + Wild +
+               " : " + Usual + ";\n";
     }
 
     std::string run(const std::string& Description) const {
@@ -154,7 +163,9 @@ private:
         for (const Variable& Each : Source.Variables)
             if (Each.Kind == VariableKind::Input)
                 Text += "    " + Mark + std::string(Each.Name) + " = 0;\n";
-        Text += "    for (int step = 0; step < Steps; ++step) {\n";
+        Text += "    int rate = 0, wild = 0;\n    for (int step = 0; step < Steps; ++step) {\n"
+                "        if (step % 600 == 0) {\n            rate = 1 << (3 * draw(0, 3));\n"
+                "            wild = draw(0, 2) == 0;\n        }\n";
         for (const Variable& Each : Source.Variables)
             if (Each.Kind == VariableKind::Input)
                 Text += setInput(Each);
