@@ -61,12 +61,6 @@ private:
     static void hearAssertion(const char* File, int Line, const char* Condition) {
         const std::string_view Path = File;
         const std::string Name(Path.substr(Path.rfind('/') + 1));
-        // Extraction stamps the block of a call that stands in for a conditional jump with the
-        // procedure of the jump's target; the client stamps all blocks anew at the end, and
-        // `checkConsistency` looks at that.
-        if (Name == "ZfCControlFlowGraphExtraction.cpp" &&
-            std::string_view(Condition) == "pInf->getProcedure() == pOldProcedure")
-            return;
         hear("assertion in " + Name, std::to_string(Line) + ": " + Condition);
     }
     static void hearLayer(int, const char* Text) { hear("container error", Text); }

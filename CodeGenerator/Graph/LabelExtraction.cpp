@@ -43,6 +43,7 @@ void LabelExtraction::run() {
     if (Labels.empty())
         return;
     splitEnds();
+    splitBranches();
     for (const LabelPlace& Label : Labels)
         extract(Label);
     putCallsAlone();
@@ -154,6 +155,23 @@ void LabelExtraction::leaveByItself(leda::edge e) {
     ZfCBasicBlock* pBlock = ZfCCfgFactory::getInstance()->createBasicBlock();
     pBlock->setProcedure(m_Graph[m_Graph.source(e)]->getProcedure());
     m_Graph.move_edge(e, m_Graph.source(e), m_Graph.new_node(pBlock));
+}
+
+/// A branch into a join goes through a block of its own, which then takes the call. Else the
+/// library would make that block, and where it extracts one join after the other it would stamp it
+/// with a procedure that the branch does not lie in.
+void LabelExtraction::splitBranches() {
+    ZfCCfgFactory* pFactory = ZfCCfgFactory::getInstance();
+    const leda::list<leda::edge> Edges = m_Graph.all_edges();
+    for (leda::edge e : Edges) {
+        leda::node v = m_Graph.target(e);
+        const ZfCBasicBlock* pSource = m_Graph[m_Graph.source(e)]->isBasicBlock();
+        if (pSource == nullptr || m_Graph.outdeg(m_Graph.source(e)) < 2 || m_Graph.indeg(v) < 2 ||
+            isOnLoop(v))
+            continue;
+        leaveByItself(e);
+        m_Graph.new_edge(m_Graph.target(e), v, pFactory->createEdgeInfo());
+    }
 }
 
 // Step 2

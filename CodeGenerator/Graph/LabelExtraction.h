@@ -42,6 +42,7 @@ private:
     bool isEnd(leda::node v) const;
     void splitEnds();
     void leaveByItself(leda::edge e);
+    void splitBranches();
     void extract(const LabelPlace& Label);
     const char* findObstacle(const LabelPlace& Label);
     void walkRegion(leda::node v);

@@ -28,7 +28,11 @@ public:
     }
 };
 
-void runRoad(const char* Text) {
+// Without inlining, so that the flow over calls is put to the test.
+const char* const Propagation = "placeExitNodes,placeLoopAroundMain,transformToSSAForm,"
+                                "divideBasicBlock,propagateSparseConditionalConstant";
+
+void runRoad(const char* Text, const char* List = Propagation) {
     SourceFiles Sources;
     Sources.add("test.hpn", Text);
     Diagnostics Messages(Sources);
@@ -38,11 +42,7 @@ void runRoad(const char* Text) {
     ProgramGraph Graph(Source);
     PassSequence Passes;
     std::string Message;
-    // Without inlining, so that the flow over calls is put to the test.
-    ASSERT_TRUE(PassSequence::parse("placeExitNodes,placeLoopAroundMain,transformToSSAForm,"
-                                    "divideBasicBlock,propagateSparseConditionalConstant",
-                                    Passes, Message))
-        << Message;
+    ASSERT_TRUE(PassSequence::parse(List, Passes, Message)) << Message;
     PassRunner Runner(Graph);
     EXPECT_TRUE(Runner.run(Passes));
     EXPECT_EQ(s_Assertions, 0);
@@ -60,6 +60,12 @@ TEST(RoadTermination, SeveralWaysOutReturnOneVersion) {
     runRoad("state uint8 x; output uint8 o;\n"
             "proc p() { if (x > 3) { x = 0; return; } x = x + 1; }\n"
             "proc main() { p(); o = x; p(); }\n");
+}
+
+// One join inside the other, both reached by a branch.
+TEST(RoadTermination, NestedExtractionKeepsEachBlockInItsProcedure) {
+    runRoad("proc main() { if (0) goto a; a: if (0) { if (0) goto b; b: } if (0) { } }\n",
+            "makeProcedureAndCall,placeExitNodes");
 }
 
 } // namespace
