@@ -44,6 +44,7 @@ void LabelExtraction::run() {
         return;
     splitEnds();
     splitBranches();
+    m_Target.expectParkedEdges(m_Graph.number_of_edges());
     for (const LabelPlace& Label : Labels)
         extract(Label);
     putCallsAlone();

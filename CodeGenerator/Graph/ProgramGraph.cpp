@@ -21,6 +21,8 @@ ProgramGraph::ProgramGraph(const Program& Source) : m_Source(Source), m_Hidden(S
 // The graph's end empties the factory, whose versions still name the client's variables; the
 // variables' sets of nodes use the library until they end.
 ProgramGraph::~ProgramGraph() {
+    for (int i = 0; i < m_ParkedEdges; ++i)
+        ZfCCfgFactory::getInstance()->createEdgeInfo();
     m_pGraph.reset();
     m_Variables.clear();
     m_Control.shutdown();

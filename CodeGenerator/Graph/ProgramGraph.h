@@ -85,12 +85,17 @@ public:
     /// it returns is current at one place when versions are made. For the moment right before SSA
     /// form.
     void joinExits();
+    /// Tells that so many edge records may have been given back to the factory by now. What is
+    /// still parked when the graph ends would be lost to the process, so the destructor takes it
+    /// into use once more.
+    void expectParkedEdges(int AtMost) { m_ParkedEdges = AtMost; }
 
 private:
     friend class GraphBuilder;
     const Program& m_Source;
     ZfCSSAControl m_Control;
     std::unique_ptr<ZfCControlFlowGraph> m_pGraph;
+    int m_ParkedEdges = 0; // at most
     HiddenVariables m_Hidden;
     std::vector<std::unique_ptr<ZfCCfgSFVariable>>
         m_Variables; // by Variable::Index, hidden ones behind the others

@@ -284,9 +284,18 @@ std::string expectedLine(const Sample& Of, const Operands& Set) {
     return bitsOf(Stored) + ' ' + (Number != 0.0 ? '1' : '0');
 }
 
+/// Boots the library for a scope.
+class LibraryRun {
+public:
+    LibraryRun() { m_Control.boot(); }
+    ~LibraryRun() { m_Control.shutdown(); }
+
+private:
+    ZfCSSAControl m_Control;
+};
+
 void compareWithOracle(unsigned Seed) {
-    ZfCSSAControl Control;
-    Control.boot();
+    const LibraryRun Library;
     Workbench Bench;
     TermArena Terms;
     ExpressionMaker Maker(Bench, Terms, Seed);
