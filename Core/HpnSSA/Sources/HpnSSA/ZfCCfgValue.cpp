@@ -1,5 +1,7 @@
 #include "ZfCCfgValue.h"
 
+#include "ZfCCfgValueMerge.h"
+
 #include <csignal>
 #include <cstdint>
 #include <cstdlib>
@@ -114,19 +116,8 @@ ZfCCfgValue applyUnary(ZfCCfgValue& Value, Operation Compute) {
     return static_cast<double>(Compute(Value.getValue()));
 }
 
-// The extreme number of a list; isBetter(a, b) tells whether a takes the place of b.
-template <class Relation>
-ZfCCfgValue determineExtreme(const leda::list<ZfCCfgValue>& ValueList, Relation isBetter) {
-    bool HasNumber = false;
-    double Number = 0.0;
-    for (const ZfCCfgValue& Value : ValueList) {
-        if (!Value.isConstant())
-            return Value.getValueKind();
-        if (!HasNumber || isBetter(Value.getValue(), Number))
-            Number = Value.getValue();
-        HasNumber = true;
-    }
-    return Number;
+const ZfCCfgValue& itself(const ZfCCfgValue& Value) {
+    return Value;
 }
 
 // The number that a variable of the type holds for Number; the first type that fits decides.
@@ -303,46 +294,21 @@ ZfCCfgValue sgn(ZfCCfgValue& Value) {
     return applyUnary(Value, [](double a) { return (a > 0.0) - (0.0 > a); });
 }
 
-// The join of values that meet:
-//
-// 1. The first element is the reference; its kind is the working kind.
-// 2. A non-constant reference decides alone.
-// 3. Of the others, a non-constant one and a constant that differs from a constant reference end
-// the walk as non-constant.
-//    An undetermined one makes the working kind undetermined and the walk goes on: unlike in the
-//    textbook it is not neutral, for a value that is not yet known on one way may still turn out to
-//    differ. The first constant behind an undetermined reference becomes the reference, so that
-//    later constants are still compared, and leaves the kind.
-// 4. A working kind other than constant is the result, without a number.
+// The first element leaves the list, as it always has.
 ZfCCfgValue intersect(leda::list<ZfCCfgValue>& ValueList) {
-    // Steps 1 and 2.
-    ZfCCfgValue ReferenceValue = ValueList.pop();
-    tagKind WorkingKind = ReferenceValue.getValueKind();
-    if (WorkingKind == eCfgValueNonConstant)
-        return WorkingKind;
-    // Step 3.
-    for (const ZfCCfgValue& Value : ValueList) {
-        if (Value.isNonConstant())
-            return eCfgValueNonConstant;
-        if (Value.isUndetermined())
-            WorkingKind = eCfgValueUndetermined;
-        else if (!ReferenceValue.isConstant())
-            ReferenceValue = Value;
-        else if (Value.getValue() != ReferenceValue.getValue())
-            return eCfgValueNonConstant;
-    }
-    // Step 4.
-    if (WorkingKind != eCfgValueConstant)
-        return WorkingKind;
-    return ReferenceValue;
+    if (ValueList.empty())
+        return ValueList.pop(); // reported by the list
+    const ZfCCfgValue Result = mergeValues(ValueList, itself);
+    ValueList.pop();
+    return Result;
 }
 
 ZfCCfgValue determineMinimum(const leda::list<ZfCCfgValue>& ValueList) {
-    return determineExtreme(ValueList, [](double a, double b) { return a < b; });
+    return mergeExtremes(ValueList, itself, [](double a, double b) { return a < b; });
 }
 
 ZfCCfgValue determineMaximum(const leda::list<ZfCCfgValue>& ValueList) {
-    return determineExtreme(ValueList, [](double a, double b) { return a > b; });
+    return mergeExtremes(ValueList, itself, [](double a, double b) { return a > b; });
 }
 
 ZfCCfgValue reference(const ZfCCfgValue&) {

@@ -33,6 +33,7 @@
 #include "ZfCSSAVariable.h"
 
 class ZfCCfgVisitor;
+class ZfCPropagationState;
 
 // The intermediate code of one whole program, and every pass over it.
 //
@@ -239,8 +240,14 @@ private:
     void buildVarUses();
     void initSparseConditionalConstant(leda::node StartNode, leda::list<leda::edge>& CfgEdgeList,
                                        leda::list<leda::edge>& SSAEdgeList);
+    void sparseConditionalConstant(bool RemoveDeadCode, ZfCPropagationState& State);
+    void serveCfgEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
+                      leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
+    void serveSSAEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
+                      leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
+    void visitIfDirty(leda::node Node, leda::list<leda::edge>& CfgEdgeList,
+                      leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
     int countExecutableInEdges(leda::node Node);
-    int countCfgOutEdges(leda::node Node);
     void setVisited(leda::node Node);
     bool isVisited(leda::node Node);
     void clearAllVisited();
@@ -254,6 +261,7 @@ private:
                          bool& FoundNewConstant);
     void visitBranchCondition(ZfCCfgExpression* pCond, leda::node Node,
                               leda::list<leda::edge>& CfgEdgeList);
+    void appendCfgOutEdges(leda::node Node, leda::list<leda::edge>& CfgEdgeList);
     void visitParamStatement(ZfCCfgParamStatement* pParamStatement, leda::node Node,
                              leda::list<leda::edge>& CfgEdgeList,
                              leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
@@ -274,7 +282,8 @@ private:
 
     leda::node m_StartNode; // entry of "#main"; null until set
     leda::dictionary<WqCXString, ZfCCfgProcedure*, leda::ab_tree> m_Procedures; // by name
-    leda::map<leda::node, bool> m_Visited; // blocks that the last iteration has reached
+    leda::map<leda::node, bool> m_Visited;         // blocks that the last iteration has reached
+    ZfCPropagationState* m_pPropagation = nullptr; // while constants are propagated
 };
 
 #endif

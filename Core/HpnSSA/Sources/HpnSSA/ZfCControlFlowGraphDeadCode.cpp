@@ -23,6 +23,7 @@
 #include "ZfCControlFlowGraph.h"
 
 #include "ZfCInternalCheck.h"
+#include "ZfCPropagationState.h"
 
 namespace {
 
@@ -65,7 +66,7 @@ leda::node nextNodeInChain(CfgGraph& Graph, leda::node w) {
 }
 
 // Step 2c: the other phi functions of the join at w lose the operand too.
-void delOperandInChain(CfgGraph& Graph, leda::node w, int Position) {
+void delOperandInChain(CfgGraph& Graph, ZfCPropagationState& State, leda::node w, int Position) {
     for (w = nextNodeInChain(Graph, w); w != nullptr; w = nextNodeInChain(Graph, w)) {
         ZfCPhiFunction* pPhi = phiFunctionAt(Graph, w);
         if (pPhi == nullptr ||
@@ -73,6 +74,7 @@ void delOperandInChain(CfgGraph& Graph, leda::node w, int Position) {
             return;
         }
         pPhi->delReplacement(Position);
+        State.markDirty(w);
     }
 }
 
@@ -196,22 +198,27 @@ void UnusedDefinitionSweeper::sweepAgain() {
 } // namespace
 
 bool ZfCControlFlowGraph::eliminateDeadCode() {
+    ZfCPropagationState& State = *m_pPropagation;
+    if (State.allBlocksAreVisited()) {
+        return false;
+    }
     bool HasLostOperand = false;
-    leda::list<leda::node> NodeList = all_nodes();
+    bool HasLostCall = false;
     leda::list<leda::edge> EdgesToDelete;
-    while (!NodeList.empty()) {
-        leda::node v = NodeList.pop();
-        ZfCBasicBlock* pBlock = isVisited(v) ? nullptr : inf(v)->isBasicBlock();
-        if (pBlock == nullptr) {
+    leda::node pNext = nullptr;
+    for (leda::node v = first_node(); v != stop_node(); v = pNext) {
+        pNext = next_node(v);
+        if (State.isVisited(v) || !State.isBasicBlock(v)) {
             continue;
         }
+        ZfCBasicBlock* pBlock = inf(v)->isBasicBlock();
         // Step 1.
         EdgesToDelete.clear();
         // Step 2: dead paths into live code. The edges stay until all are found, so a second edge
         // into the same phi function is counted with the first still in place.
         for (leda::edge e = first_adj_edge(v); e != nullptr; e = adj_succ(e)) {
             leda::node w = target(e);
-            if (inf(e)->isSSAEdge() != nullptr || !isVisited(w)) {
+            if (State.isSSAEdge(e) || !State.isVisited(w)) {
                 continue;
             }
             ZfCPhiFunction* pPhi = phiFunctionAt(*this, w);
@@ -221,9 +228,10 @@ bool ZfCControlFlowGraph::eliminateDeadCode() {
             // Steps 2a, 2b and 2c.
             int Position = operandPosition(*this, e);
             pPhi->delReplacement(Position);
+            State.markDirty(w);
             HasLostOperand = true;
             EdgesToDelete.append(e);
-            delOperandInChain(*this, w, Position);
+            delOperandInChain(*this, State, w, Position);
         }
         // Step 3.
         while (!EdgesToDelete.empty()) {
@@ -233,12 +241,17 @@ bool ZfCControlFlowGraph::eliminateDeadCode() {
         if (ZfCCfgStatement* pStmt = onlyStatement(pBlock)) {
             if (ZfCCfgProcedureCall* pCall = pStmt->isProcedureCall()) {
                 forgetCall(m_Procedures, pCall);
+                HasLostCall = true;
             }
             pBlock->del(pStmt);
         }
         // Step 5.
+        State.forget(v);
         ZfCCfgFactory::getInstance()->delBasicBlock(pBlock);
         del_node(v);
+    }
+    if (HasLostCall) {
+        State.markParametersDirty();
     }
     return HasLostOperand;
 }

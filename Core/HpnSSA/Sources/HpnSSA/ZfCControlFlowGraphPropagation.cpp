@@ -16,10 +16,12 @@
 // function that changes sends no SSA edges; its users follow in the next iteration. Each of these
 // keeps a value from being called constant too early.
 //
-// Departure, in cost alone: whether a block has an executable in-edge is read from its visited
-// mark. Flags and marks are cleared together, and whoever sets the flag of an edge into a block
-// marks the block, so the mark says the same as a count over the in-edges and does not take the
-// square of them at a wide join.
+// Departures, in cost alone. Flags and marks of the run are kept in flat tables and written to the
+// records at its end. Whether a block has an executable in-edge is read from its visited mark:
+// whoever sets the flag of an edge into a block marks the block, so the mark says the same as a
+// count over the in-edges and does not take the square of them at a wide join. A node none of whose
+// operands has changed since its last visit is not evaluated again, for that would give what is
+// there already; see ZfCPropagationState.h.
 //
 // An iteration is linear in the edges of both kinds and in how often a value changes, which is at
 // most a few times for each variable.
@@ -27,10 +29,17 @@
 #include "ZfCControlFlowGraph.h"
 
 #include "ZfCInternalCheck.h"
+#include "ZfCPropagationState.h"
 
 void ZfCControlFlowGraph::propagateSparseConditionalConstant(bool RemoveDeadCode) {
     addSSAEdges();
-    sparseConditionalConstant(RemoveDeadCode);
+    ZfCPropagationState State(*this, true);
+    sparseConditionalConstant(RemoveDeadCode, State);
+}
+
+void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
+    ZfCPropagationState State(*this, false);
+    sparseConditionalConstant(RemoveDeadCode, State);
 }
 
 void ZfCControlFlowGraph::buildVarUses() {
@@ -80,17 +89,7 @@ void ZfCControlFlowGraph::initSparseConditionalConstant(leda::node StartNode,
 int ZfCControlFlowGraph::countExecutableInEdges(leda::node Node) {
     int Count = 0;
     for (leda::edge e = first_in_edge(Node); e != nullptr; e = in_succ(e)) {
-        if (inf(e)->isEdgeExecutable()) {
-            ++Count;
-        }
-    }
-    return Count;
-}
-
-int ZfCControlFlowGraph::countCfgOutEdges(leda::node Node) {
-    int Count = 0;
-    for (leda::edge e = first_adj_edge(Node); e != nullptr; e = adj_succ(e)) {
-        if (inf(e)->isSSAEdge() == nullptr) {
+        if (m_pPropagation->isExecutable(e)) {
             ++Count;
         }
     }
@@ -102,16 +101,68 @@ void ZfCControlFlowGraph::setVisited(leda::node Node) {
 }
 
 bool ZfCControlFlowGraph::isVisited(leda::node Node) {
-    return m_Visited[Node];
+    return m_pPropagation->isVisited(Node);
 }
 
 void ZfCControlFlowGraph::clearAllVisited() {
-    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
-        m_Visited[v] = false;
+    m_Visited.clear_entries();
+}
+
+// Step 3c: a phi function is visited over each edge, anything else on first arrival.
+void ZfCControlFlowGraph::serveCfgEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
+                                       leda::list<leda::edge>& SSAEdgeList,
+                                       bool& FoundNewConstant) {
+    ZfCPropagationState& State = *m_pPropagation;
+    if (State.isExecutable(e)) {
+        return;
+    }
+    // Step 3c1.
+    State.setExecutable(e);
+    leda::node Target = target(e);
+    // Step 3c2.
+    if (State.isBasicBlock(Target)) {
+        bool IsFirstArrival = State.arriveAt(Target);
+        if (IsFirstArrival || State.isPhiFunction(Target)) {
+            visitIfDirty(Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
+        }
+    }
+    // Step 3c3: without a branch, control goes on.
+    if (leda::edge f = State.onlyCfgOutEdge(Target)) {
+        CfgEdgeList.append(f);
     }
 }
 
-void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
+// Step 3d.
+void ZfCControlFlowGraph::serveSSAEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
+                                       leda::list<leda::edge>& SSAEdgeList,
+                                       bool& FoundNewConstant) {
+    leda::node Target = target(e);
+    // A change waits until control reaches the use.
+    if (m_pPropagation->isVisited(Target) || m_pPropagation->isPhiFunction(Target)) {
+        visitIfDirty(Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
+    }
+}
+
+void ZfCControlFlowGraph::visitIfDirty(leda::node Node, leda::list<leda::edge>& CfgEdgeList,
+                                       leda::list<leda::edge>& SSAEdgeList,
+                                       bool& FoundNewConstant) {
+    ZfCPropagationState& State = *m_pPropagation;
+    if (!State.takeDirty(Node)) {
+        State.takeAgain(Node, CfgEdgeList);
+        return;
+    }
+    ZfCBasicBlock* pBlock = inf(Node)->isBasicBlock();
+    if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
+        visitPhiFunction(pPhi, Node, FoundNewConstant);
+    } else {
+        ZF_ASSERT(countExecutableInEdges(Node) >= 1);
+        visitInstruction(pBlock, Node, CfgEdgeList, SSAEdgeList, FoundNewConstant);
+    }
+}
+
+void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode,
+                                                    ZfCPropagationState& State) {
+    m_pPropagation = &State;
     // Step 1: the entry nodes of all procedures, once for all iterations.
     leda::list<leda::node> StartNodeList;
     for (auto Item = m_Procedures.first_item(); Item; Item = m_Procedures.next_item(Item)) {
@@ -121,63 +172,19 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
     leda::list<leda::edge> SSAEdgeList;
     bool FoundNewConstant = false;
     bool HasLostOperand = false;
-
-    // Steps 3c and 3d for one edge each.
-    auto ServeCfgEdge = [&](leda::edge e) {
-        if (inf(e)->isEdgeExecutable()) {
-            return;
-        }
-        // Step 3c1.
-        inf(e)->activateEdgeExecutable();
-        leda::node Target = target(e);
-        // Step 3c2: a phi function is visited over each edge, anything else on first arrival.
-        if (ZfCBasicBlock* pBlock = inf(Target)->isBasicBlock()) {
-            bool IsFirstArrival = !isVisited(Target);
-            setVisited(Target);
-            if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
-                visitPhiFunction(pPhi, Target, FoundNewConstant);
-            } else if (IsFirstArrival) {
-                ZF_ASSERT(countExecutableInEdges(Target) == 1);
-                visitInstruction(pBlock, Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
-            }
-        }
-        // Step 3c3: without a branch, control goes on.
-        if (countCfgOutEdges(Target) == 1) {
-            leda::edge f = first_adj_edge(Target);
-            while (inf(f)->isSSAEdge() != nullptr) {
-                f = adj_succ(f);
-            }
-            CfgEdgeList.append(f);
-        }
-    };
-    auto ServeSSAEdge = [&](leda::edge e) {
-        leda::node Target = target(e);
-        ZfCBasicBlock* pBlock = inf(Target)->isBasicBlock();
-        if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
-            visitPhiFunction(pPhi, Target, FoundNewConstant);
-        } else if (isVisited(Target)) {
-            ZF_ASSERT(countExecutableInEdges(Target) >= 1);
-            visitInstruction(pBlock, Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
-        }
-        // Otherwise the change waits until control reaches the use.
-    };
-
     do {
         // Step 2: a clean start, but for the values.
         FoundNewConstant = false;
-        clearAllVisited();
-        for (leda::edge e = first_edge(); e != stop_edge(); e = next_edge(e)) {
-            inf(e)->deactivateEdgeExecutable();
-        }
+        State.beginIteration();
         // Step 3: the sweeps.
         for (leda::node StartNode : StartNodeList) {
             initSparseConditionalConstant(StartNode, CfgEdgeList, SSAEdgeList);
             while (!CfgEdgeList.empty() || !SSAEdgeList.empty()) {
                 if (!CfgEdgeList.empty()) {
-                    ServeCfgEdge(CfgEdgeList.pop());
+                    serveCfgEdge(CfgEdgeList.pop(), CfgEdgeList, SSAEdgeList, FoundNewConstant);
                 }
                 if (!SSAEdgeList.empty()) {
-                    ServeSSAEdge(SSAEdgeList.pop());
+                    serveSSAEdge(SSAEdgeList.pop(), CfgEdgeList, SSAEdgeList, FoundNewConstant);
                 }
             }
         }
@@ -187,4 +194,13 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
         }
         // Step 5.
     } while (FoundNewConstant || HasLostOperand);
+    // The marks and flags of the last iteration stay.
+    clearAllVisited();
+    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
+        if (State.isVisited(v)) {
+            setVisited(v);
+        }
+    }
+    State.finish();
+    m_pPropagation = nullptr;
 }

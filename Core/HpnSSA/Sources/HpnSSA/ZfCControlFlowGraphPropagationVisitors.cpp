@@ -12,23 +12,61 @@
 
 #include "ZfCControlFlowGraph.h"
 
+#include "ZfCCfgValueMerge.h"
+#include "ZfCPropagationState.h"
+
+#include <algorithm>
+#include <cstring>
+
 namespace {
 
-using CfgGraph = leda::GRAPH<ZfCCfgNodeInfo*, ZfCCfgEdgeInfo*>;
+// The number counts only while it is constant, and then by its bits: this decides whether users
+// look again, and a NaN or the other zero is a change for them.
+bool isSame(const ZfCCfgValue& a, const ZfCCfgValue& b) {
+    const double Left = a.getValue();
+    const double Right = b.getValue();
+    return a.getValueKind() == b.getValueKind() &&
+           (!a.isConstant() || std::memcmp(&Left, &Right, sizeof(double)) == 0);
+}
+
+// Value and range of a variable before a visit.
+class ChangeWatch {
+public:
+    explicit ChangeWatch(ZfCCfgVariable* pVariable)
+        : m_pVariable(pVariable), m_Value(pVariable->getValue()), m_Min(pVariable->getMinValue()),
+          m_Max(pVariable->getMaxValue()) {}
+
+    ZfCCfgValue& oldValue() { return m_Value; }
+    bool hasChanged() const {
+        return !isSame(m_Value, m_pVariable->getValue()) ||
+               !isSame(m_Min, m_pVariable->getMinValue()) ||
+               !isSame(m_Max, m_pVariable->getMaxValue());
+    }
+
+private:
+    ZfCCfgVariable* m_pVariable;
+    ZfCCfgValue m_Value;
+    ZfCCfgValue m_Min;
+    ZfCCfgValue m_Max;
+};
 
 // The common visit of an assignment, a parameter and a value return statement; Source is what
 // gives value and range.
 template <class TSource>
-void visitDefinition(CfgGraph& Graph, ZfCCfgVariable* pVariable, TSource* pSource, leda::node Node,
-                     leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant) {
+void visitDefinition(ZfCPropagationState& State, ZfCCfgVariable* pVariable, TSource* pSource,
+                     leda::node Node, leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant) {
     // Step 1.
-    ZfCCfgValue OldValue = pVariable->getValue();
+    ChangeWatch Watch(pVariable);
+    ZfCCfgValue OldValue = Watch.oldValue();
     // Steps 2 and 3: afterwards the value is what the variable can hold of it.
     ZfCCfgValue RHSValue = pSource->evaluate();
     pVariable->setVarValueAndAdjustCfgValue(RHSValue);
     // Step 4: the range is stored at every visit.
     pVariable->setMinValueAndDestroyOld(pSource->getMinimum());
     pVariable->setMaxValueAndDestroyOld(pSource->getMaximum());
+    if (Watch.hasChanged()) {
+        State.markUsersDirty(Node);
+    }
     // Step 5.
     if (OldValue.compare(RHSValue) == 0) {
         return;
@@ -38,20 +76,60 @@ void visitDefinition(CfgGraph& Graph, ZfCCfgVariable* pVariable, TSource* pSourc
         FoundNewConstant = true;
     }
     // Step 7: any change of value concerns the users.
-    for (leda::edge e = Graph.first_adj_edge(Node); e != nullptr; e = Graph.adj_succ(e)) {
-        if (Graph.inf(e)->isSSAEdge() != nullptr) {
-            SSAEdgeList.append(e);
-        }
-    }
+    State.appendSSAOutEdges(Node, SSAEdgeList);
 }
 
-void appendCfgOutEdges(CfgGraph& Graph, leda::node Node, leda::list<leda::edge>& CfgEdgeList) {
-    for (leda::edge e = Graph.first_adj_edge(Node); e != nullptr; e = Graph.adj_succ(e)) {
-        if (Graph.inf(e)->isSSAEdge() == nullptr) {
-            CfgEdgeList.append(e);
+// The distinct operands of a phi function in the order of variables. Nearly all have few.
+class PhiOperands {
+public:
+    explicit PhiOperands(ZfCPhiFunction* pPhi) {
+        leda::array<ZfCCfgVariable*> const& Operands = pPhi->showReplacementVariables();
+        for (int i = 0; i < Operands.size(); ++i) {
+            if (Operands[i] == nullptr || !insert(Operands[i])) {
+                copy(pPhi->getUsedVariables());
+                return;
+            }
         }
     }
-}
+
+    ZfCCfgVariable* const* begin() const { return m_pFirst; }
+    ZfCCfgVariable* const* end() const { return m_pFirst + m_Size; }
+    int size() const { return m_Size; }
+
+private:
+    static constexpr int s_Few = 8;
+
+    bool insert(ZfCCfgVariable* pVariable) {
+        int At = m_Size;
+        while (At > 0 && leda::compare(pVariable, m_Few[At - 1]) < 0) {
+            --At;
+        }
+        if (At > 0 && m_Few[At - 1] == pVariable) {
+            return true;
+        }
+        if (m_Size == s_Few) {
+            return false;
+        }
+        std::copy_backward(m_Few + At, m_Few + m_Size, m_Few + m_Size + 1);
+        m_Few[At] = pVariable;
+        ++m_Size;
+        return true;
+    }
+
+    void copy(leda::set<ZfCCfgVariable*, leda::avl_tree> const& Operands) {
+        m_Many = leda::array<ZfCCfgVariable*>(Operands.size());
+        m_Size = 0;
+        for (ZfCCfgVariable* pVariable : Operands) {
+            m_Many[m_Size++] = pVariable;
+        }
+        m_pFirst = &m_Many[0];
+    }
+
+    ZfCCfgVariable* m_Few[s_Few] = {};
+    leda::array<ZfCCfgVariable*> m_Many;
+    ZfCCfgVariable* const* m_pFirst = m_Few;
+    int m_Size = 0;
+};
 
 } // namespace
 
@@ -86,15 +164,25 @@ void ZfCControlFlowGraph::visitInstruction(ZfCBasicBlock* pBlock, leda::node Nod
         }
     }
     // Step 6: nothing to evaluate. What a call does stands in the statements around it.
-    appendCfgOutEdges(*this, Node, CfgEdgeList);
+    appendCfgOutEdges(Node, CfgEdgeList);
+}
+
+void ZfCControlFlowGraph::appendCfgOutEdges(leda::node Node, leda::list<leda::edge>& CfgEdgeList) {
+    m_pPropagation->beginBranch(Node);
+    int Position = 0;
+    for (leda::edge e = first_adj_edge(Node); e != nullptr; e = adj_succ(e)) {
+        if (!m_pPropagation->isSSAEdge(e)) {
+            m_pPropagation->take(Node, Position++, e, CfgEdgeList);
+        }
+    }
 }
 
 void ZfCControlFlowGraph::visitAssignment(ZfCCfgAssignment* pAssignment, leda::node Node,
                                           leda::list<leda::edge>& /*CfgEdgeList*/,
                                           leda::list<leda::edge>& SSAEdgeList,
                                           bool& FoundNewConstant) {
-    visitDefinition(*this, pAssignment->getLHS(), pAssignment->getRHS(), Node, SSAEdgeList,
-                    FoundNewConstant);
+    visitDefinition(*m_pPropagation, pAssignment->getLHS(), pAssignment->getRHS(), Node,
+                    SSAEdgeList, FoundNewConstant);
 }
 
 void ZfCControlFlowGraph::visitParamStatement(ZfCCfgParamStatement* pParamStatement,
@@ -102,63 +190,72 @@ void ZfCControlFlowGraph::visitParamStatement(ZfCCfgParamStatement* pParamStatem
                                               leda::list<leda::edge>& /*CfgEdgeList*/,
                                               leda::list<leda::edge>& SSAEdgeList,
                                               bool& FoundNewConstant) {
-    visitDefinition(*this, pParamStatement->getVariable(), pParamStatement, Node, SSAEdgeList,
-                    FoundNewConstant);
+    visitDefinition(*m_pPropagation, pParamStatement->getVariable(), pParamStatement, Node,
+                    SSAEdgeList, FoundNewConstant);
 }
 
 void ZfCControlFlowGraph::visitValueReturnStatement(
     ZfCCfgValueReturnStatement* pValueReturnStatement, leda::node Node,
     leda::list<leda::edge>& /*CfgEdgeList*/, leda::list<leda::edge>& SSAEdgeList,
     bool& FoundNewConstant) {
-    visitDefinition(*this, pValueReturnStatement->getVariable(),
+    visitDefinition(*m_pPropagation, pValueReturnStatement->getVariable(),
                     pValueReturnStatement->getExpression(), Node, SSAEdgeList, FoundNewConstant);
 }
 
 void ZfCControlFlowGraph::visitBranchCondition(ZfCCfgExpression* pCond, leda::node Node,
                                                leda::list<leda::edge>& CfgEdgeList) {
-    // Step 1.
+    // Step 1. A condition without variables is the client's alone to answer, in each iteration.
     ZfCCfgValue Value = pCond->evaluate();
+    if (!m_pPropagation->hasSSAInEdge(Node)) {
+        m_pPropagation->markDirty(Node);
+    }
     // Step 3: optimistic about values, not about conditions.
     if (!Value.isConstant()) {
-        appendCfgOutEdges(*this, Node, CfgEdgeList);
+        appendCfgOutEdges(Node, CfgEdgeList);
         return;
     }
     // Step 2: anything but 0.0 is true, a NaN too.
     bool IsFalse = Value.getValue() == 0.0;
+    m_pPropagation->beginBranch(Node);
+    int Position = 0;
     for (leda::edge e = first_adj_edge(Node); e != nullptr; e = adj_succ(e)) {
         bool IsTaken =
             IsFalse ? inf(e)->isFalseBranch() != nullptr : inf(e)->isTrueBranch() != nullptr;
         if (IsTaken) {
-            CfgEdgeList.append(e);
+            m_pPropagation->take(Node, Position, e, CfgEdgeList);
+        }
+        if (!m_pPropagation->isSSAEdge(e)) {
+            ++Position;
         }
     }
 }
 
-void ZfCControlFlowGraph::visitPhiFunction(ZfCPhiFunction* pPhi, leda::node /*Node*/,
+void ZfCControlFlowGraph::visitPhiFunction(ZfCPhiFunction* pPhi, leda::node Node,
                                            bool& FoundNewConstant) {
     // Step 1.
     ZfCCfgVariable* pVariable = pPhi->getVariable();
-    ZfCCfgValue OldValue = pVariable->getValue();
+    ChangeWatch Watch(pVariable);
     // Steps 2 and 3: the distinct operands, reached or not.
-    leda::set<ZfCCfgVariable*, leda::avl_tree> SSAVariables = pPhi->getUsedVariables();
-    leda::list<ZfCCfgValue> ValueList;
-    leda::list<ZfCCfgValue> MinValueList;
-    leda::list<ZfCCfgValue> MaxValueList;
-    for (ZfCCfgVariable* pOperand : SSAVariables) {
-        ValueList.append(pOperand->getValue());
-        MinValueList.append(pOperand->getMinValue());
-        MaxValueList.append(pOperand->getMaxValue());
-    }
+    PhiOperands SSAVariables(pPhi);
     // Steps 4 and 5.
-    ZfCCfgValue LHSValue = intersect(ValueList);
+    ZfCCfgValue LHSValue =
+        mergeValues(SSAVariables, [](ZfCCfgVariable* pOperand) { return pOperand->getValue(); });
     pVariable->setVarValueAndAdjustCfgValue(LHSValue);
     // Step 6: here a step up from non-constant counts as well.
-    if (!OldValue.isConstant() && LHSValue.isConstant()) {
+    if (!Watch.oldValue().isConstant() && LHSValue.isConstant()) {
         FoundNewConstant = true;
     }
-    // Steps 7 and 8.
-    ZfCCfgValue MinValue = determineMinimum(MinValueList);
+    // Steps 7 and 8. An operand may be the variable itself: its old maximum counts, and nothing
+    // but its minimum has changed by then.
+    ZfCCfgValue MinValue = mergeExtremes(
+        SSAVariables, [](ZfCCfgVariable* pOperand) { return pOperand->getMinValue(); },
+        [](double a, double b) { return a < b; });
+    ZfCCfgValue MaxValue = mergeExtremes(
+        SSAVariables, [](ZfCCfgVariable* pOperand) { return pOperand->getMaxValue(); },
+        [](double a, double b) { return a > b; });
     pVariable->setMinValueAndDestroyOld(MinValue);
-    ZfCCfgValue MaxValue = determineMaximum(MaxValueList);
     pVariable->setMaxValueAndDestroyOld(MaxValue);
+    if (Watch.hasChanged()) {
+        m_pPropagation->markUsersDirty(Node);
+    }
 }

@@ -37,6 +37,10 @@ public:
     }
     // A copy of the operands.
     leda::array<ZfCCfgVariable*> getReplacementVariables() { return m_pReplacementVariable; }
+    // The operands themselves, valid until the phi function changes.
+    leda::array<ZfCCfgVariable*> const& showReplacementVariables() const {
+        return m_pReplacementVariable;
+    }
     // Takes operand Pos out; those behind it close up in their order. A position that is not there
     // is an internal error, and the last operand goes.
     void delReplacement(int Pos);
