@@ -4,6 +4,7 @@
 #include "Model/PendingWarnings.h"
 #include "Model/ZfCCfgSFVariable.h"
 
+#include <algorithm>
 #include <cmath>
 
 using hpn::Operator;
@@ -91,9 +92,74 @@ bool isTellingConstant(ZfCCfgVariable* pVariable, double Number) {
     return hpn::convertNumber(Number, Of) == Number;
 }
 
+/// What the last evaluation found, for the two questions about the ends that follow it: the walks
+/// over the term are the dearest part of the propagation. It holds as long as the term and the
+/// variables that it reads, which are remembered with what they held, are the same.
+class LastEvaluation {
+public:
+    const ZfCCfgValue& value() const { return m_Value; }
+    const hpn::ValueRange& range() const { return m_Range; }
+
+    void remember(const Term* pRoot, const ZfCCfgValue& Value, const hpn::ValueRange& Range) {
+        m_NumberOfReads = 0;
+        m_pRoot = noteReads(pRoot) ? pRoot : nullptr;
+        m_Value = Value;
+        m_Range = Range;
+    }
+    void forget() { m_pRoot = nullptr; }
+
+    bool holdsFor(const Term* pRoot) const {
+        return pRoot == m_pRoot && std::all_of(m_Reads, m_Reads + m_NumberOfReads, isUnchanged);
+    }
+
+private:
+    struct Read {
+        ZfCCfgVariable* pVariable;
+        ZfCCfgValue Value;
+        ZfCCfgValue Minimum;
+        ZfCCfgValue Maximum;
+    };
+    static constexpr int s_MostReads = 4; // terms with more are computed again
+
+    static bool isSame(const ZfCCfgValue& a, const ZfCCfgValue& b) {
+        return a.getValueKind() == b.getValueKind() &&
+               (!a.isConstant() || (a.getValue() == b.getValue() &&
+                                    std::signbit(a.getValue()) == std::signbit(b.getValue())));
+    }
+    static bool isUnchanged(const Read& Of) {
+        return isSame(Of.Value, Of.pVariable->getValue()) &&
+               isSame(Of.Minimum, Of.pVariable->getMinValue()) &&
+               isSame(Of.Maximum, Of.pVariable->getMaxValue());
+    }
+
+    bool noteReads(const Term* pTerm) {
+        if (pTerm == nullptr)
+            return true;
+        if (pTerm->pVariable != nullptr) {
+            if (m_NumberOfReads == s_MostReads)
+                return false;
+            ZfCCfgVariable* pVariable = pTerm->pVariable;
+            m_Reads[m_NumberOfReads++] = {pVariable, pVariable->getValue(),
+                                          pVariable->getMinValue(), pVariable->getMaxValue()};
+        }
+        return noteReads(pTerm->pLeft) && noteReads(pTerm->pRight);
+    }
+
+    const Term* m_pRoot = nullptr;
+    ZfCCfgValue m_Value;
+    hpn::ValueRange m_Range;
+    int m_NumberOfReads = 0;
+    Read m_Reads[s_MostReads];
+};
+
+/// One is enough: the questions about one expression follow each other.
+LastEvaluation s_LastEvaluation;
+
 } // namespace
 
+// The arena may give out the term of an earlier program again.
 ZfCCfgSFExpression::ZfCCfgSFExpression(Term* pRoot) : m_pRoot(pRoot) {
+    s_LastEvaluation.forget();
 }
 
 ZfCCfgSFExpression::~ZfCCfgSFExpression() = default;
@@ -105,11 +171,13 @@ leda::set<ZfCCfgVariable*, leda::avl_tree> ZfCCfgSFExpression::getUsedVariables(
 }
 
 void ZfCCfgSFExpression::replaceVariable(ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
+    s_LastEvaluation.forget();
     replaceRead(m_pRoot, pOld, pNew);
     m_IsSettled = false;
 }
 
 void ZfCCfgSFExpression::replaceConditionWithConstant(double Number) {
+    s_LastEvaluation.forget();
     becomeNumber(m_pRoot, Number);
     m_IsSettled = false;
 }
@@ -119,7 +187,15 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
         return ZfCCfgValue(eCfgValueNonConstant);
     if (m_IsSettled)
         return ZfCCfgValue(m_SettledNumber);
-    ZfCCfgValue Value = hpn::valueOfTerm(m_pRoot);
+    ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
+    if (!Value.isConstant() && m_pRoot->Op != Operator::Element) {
+        // An undetermined operand counts with all that its type can hold, so a single number holds
+        // whatever it becomes.
+        const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
+        s_LastEvaluation.remember(m_pRoot, Value, Range);
+        if (Range.isSingle())
+            Value = ZfCCfgValue(Range.Low);
+    }
     if (Value.isConstant()) {
         m_IsSettled = true;
         m_SettledNumber = Value.getValue();
@@ -135,14 +211,24 @@ ZfCCfgValue ZfCCfgSFExpression::getMaximum() {
     return getEnd(true);
 }
 
+ZfCCfgValue ZfCCfgSFExpression::getEndOfNumber(double Number) {
+    return std::isnan(Number) ? ZfCCfgValue(eCfgValueNonConstant) : ZfCCfgValue(Number);
+}
+
 ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
     if (isMarkedAsEvalToNonConst() || m_pRoot->Op == Operator::Element)
         return ZfCCfgValue(eCfgValueNonConstant);
-    const ZfCCfgValue Value =
-        m_IsSettled ? ZfCCfgValue(m_SettledNumber) : hpn::latticeValueOfTerm(m_pRoot);
-    if (Value.isConstant())
-        return std::isnan(Value.getValue()) ? ZfCCfgValue(eCfgValueNonConstant) : Value;
-    const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
+    if (m_IsSettled)
+        return getEndOfNumber(m_SettledNumber);
+    if (!s_LastEvaluation.holdsFor(m_pRoot)) {
+        const ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
+        if (Value.isConstant())
+            return getEndOfNumber(Value.getValue());
+        s_LastEvaluation.remember(m_pRoot, Value,
+                                  hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation));
+    }
+    const ZfCCfgValue Value = s_LastEvaluation.value();
+    const hpn::ValueRange& Range = s_LastEvaluation.range();
     if (Value.isUndetermined() && !Range.isSingle())
         return Value;
     if (Range.MayBeNaN || Range.isEmpty())
@@ -151,6 +237,7 @@ ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
 }
 
 void ZfCCfgSFExpression::replaceConstantVariables() {
+    s_LastEvaluation.forget();
     replaceConstantReads(m_pRoot);
 }
 
@@ -159,11 +246,14 @@ void ZfCCfgSFExpression::replaceConstantCondition() {
     if (hasSideEffects())
         return;
     ZfCCfgValue Value = evaluate();
-    if (Value.isConstant())
+    if (Value.isConstant()) {
+        s_LastEvaluation.forget();
         becomeNumber(m_pRoot, Value.getValue());
+    }
 }
 
 void ZfCCfgSFExpression::foldConstants() {
+    s_LastEvaluation.forget();
     hpn::foldTerm(m_pRoot);
 }
 

@@ -39,6 +39,7 @@ protected:
 
 private:
     ZfCCfgValue getEnd(bool IsMaximum);
+    static ZfCCfgValue getEndOfNumber(double Number);
 
     hpn::Term* m_pRoot;
     /// It has evaluated to a constant, and stays at it: what propagation concludes holds for every
