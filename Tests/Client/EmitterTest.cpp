@@ -1,6 +1,6 @@
-#include "CRunner.h"
 #include "Emitter/CNames.h"
-#include "ProgramComparison.h"
+#include "Oracles/CRunner.h"
+#include "Oracles/ProgramComparison.h"
 
 #include <gtest/gtest.h>
 
@@ -12,10 +12,10 @@ using namespace hpn;
 
 std::string emitted(const std::string& Text, const PassSequence& Passes = PassSequence(),
                     const std::string& Prefix = "") {
-    const ReadText Read(Text);
-    if (!Read.program())
+    const ReadText Read({{"test.hpn", Text}});
+    if (!Read.isRead())
         return Read.messages();
-    return ProgramComparison::emit(*Read.program(), Prefix, Passes);
+    return ProgramComparison::emit(Read.program(), Prefix, Passes);
 }
 
 std::string optimised(const std::string& Text) {

@@ -1,5 +1,5 @@
-#include "ProgramComparison.h"
-#include "RandomProgram.h"
+#include "Generators/RandomProgram.h"
+#include "Oracles/ProgramComparison.h"
 
 #include <gtest/gtest.h>
 

@@ -1,4 +1,4 @@
-#include "RandomProgram.h"
+#include "Generators/RandomProgram.h"
 #include "ReaderTestSupport.h"
 
 #include <gtest/gtest.h>

@@ -2,8 +2,8 @@
 
 #include <random>
 
-#include "Interpreter.h"
-#include "SSAVerifier.h"
+#include "Oracles/Interpreter.h"
+#include "Oracles/SSAVerifier.h"
 
 namespace passes {
 namespace {

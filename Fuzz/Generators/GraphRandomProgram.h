@@ -1,7 +1,10 @@
 #ifndef GRAPHRANDOMPROGRAM_H
 #define GRAPHRANDOMPROGRAM_H
 
-#include "GraphTestProgram.h"
+#include "Generators/GraphTestProgram.h"
+
+#include <random>
+#include <vector>
 
 namespace hpn::test {
 

@@ -1,4 +1,4 @@
-#include "PointedProgram.h"
+#include "Generators/PointedProgram.h"
 
 #include <iterator>
 
