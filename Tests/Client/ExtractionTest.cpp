@@ -164,7 +164,7 @@ TEST(Extraction, RandomProgramsKeepShapeAndOutputs) {
     for (unsigned Batch = 0; Batch < 2; ++Batch) {
         ProgramComparison Comparison;
         for (unsigned i = 0; i < 15; ++i) {
-            const std::string Text = RandomProgram(7000 + Batch * 15 + i).text();
+            const std::string Text = hpn::fuzz::RandomProgram(7000 + Batch * 15 + i).text();
             const Extracted Result(Text);
             Procedures += Result.Procedures.empty() ? 0 : 1;
             Remarks += Result.Remarks.empty() ? 0 : 1;
