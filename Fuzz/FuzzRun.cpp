@@ -1,9 +1,9 @@
 #include "FuzzRun.h"
 
-#include "PointedProgram.h"
+#include "Generators/PointedProgram.h"
 #include "Shrinker.h"
 
-#include "Client/RandomProgram.h"
+#include "Generators/RandomProgram.h"
 
 #include <chrono>
 #include <csignal>

@@ -8,7 +8,7 @@
 #include "Language/Reader.h"
 #include "Language/SourceFiles.h"
 #include "Model/PendingWarnings.h"
-#include "Passes/SSAVerifier.h"
+#include "Oracles/SSAVerifier.h"
 #include "Road/PassRunner.h"
 #include "Road/Statistics.h"
 #include "ZfCMessageSink.h"

@@ -77,9 +77,17 @@ void FunctionWriter::writeLocals(const EmittedFunction& Function) {
         m_Out += '\n';
     for (const auto& [pFormal, Name] : m_CopiedParameters)
         m_Out.append("    ").append(m_Names.nameOf(*pFormal)).append(" = ").append(Name) += ";\n";
+}
+
+/// Parameters that the body's text does not read; it may have them in terms that stand as numbers.
+std::string FunctionWriter::unreadParameters(const EmittedFunction& Function) const {
+    const std::vector<const Variable*>& Reads = m_Expressions.getReads();
+    std::string Text;
     for (const Variable* pFormal : Function.Parameters)
-        if (m_Functions.isLocal(pFormal) && !m_Functions.getUse().isRead(pFormal))
-            m_Out.append("    (void)").append(m_Names.nameOf(*pFormal)) += ";\n";
+        if (m_Functions.isLocal(pFormal) &&
+            std::find(Reads.begin(), Reads.end(), pFormal) == Reads.end())
+            Text.append("    (void)").append(m_Names.nameOf(*pFormal)) += ";\n";
+    return Text;
 }
 
 void FunctionWriter::writeBody(int Number) {
@@ -88,8 +96,11 @@ void FunctionWriter::writeBody(int Number) {
     m_Depth = 1;
     m_Out += " {\n";
     writeLocals(Function);
+    m_Expressions.clearReads();
+    const std::size_t Start = m_Out.size();
     if (!Function.Flow.Nodes.empty())
         writeFlow(Function);
+    m_Out.insert(Start, unreadParameters(Function));
     if (Function.pSource && Function.pSource->IsExported && Function.pSource->pResult)
         writeReturn();
     m_Out += "}\n";

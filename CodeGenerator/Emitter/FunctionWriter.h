@@ -43,6 +43,7 @@ public:
 private:
     void nameLocals(const EmittedFunction& Function);
     void writeLocals(const EmittedFunction& Function);
+    std::string unreadParameters(const EmittedFunction& Function) const;
     void writeFlow(const EmittedFunction& Function);
     void writeToken(const StructureToken& Token, bool IsLast);
     void writeItem(const FlowItem& Item);

@@ -1,6 +1,7 @@
 #include "Emitter/VariableUse.h"
 
 #include "Emitter/FlowDominators.h"
+#include "Model/Conversion.h"
 #include "Model/ZfCCfgSFExpression.h"
 #include "Model/ZfCCfgSFProcedureCall.h"
 
@@ -55,41 +56,68 @@ void VariableUse::addWrite(int Function, const Variable* pVariable) {
 
 namespace {
 
-class NoNames : public VariableNames {
+/// A name for each variable: two with one name would make a comparison look like one of a number
+/// with itself.
+class NumberNames : public VariableNames {
 public:
-    std::string_view nameOf(const Variable& Declaration) const override { return Declaration.Name; }
+    std::string_view nameOf(const Variable& Declaration) const override {
+        m_Name = 'v' + std::to_string(Declaration.Index);
+        return m_Name;
+    }
+
+private:
+    mutable std::string m_Name;
 };
 
-/// Something in the term could be written as a number though it reads variables, and it would
-/// matter: a read of a variable that is only declared if it is read.
-bool mayLoseReads(const Term* pTerm, bool& ReadsOwn, bool& Folds) {
+/// Whether it matters that a read is not written: of a variable that is declared only if it is
+/// read.
+bool readsOwn(const Term* pTerm) {
     if (pTerm->pVariable) {
         const VariableKind Kind = declarationOf(pTerm->pVariable)->Kind;
-        ReadsOwn = ReadsOwn || Kind == VariableKind::Local || Kind == VariableKind::Formal ||
-                   Kind == VariableKind::Param;
+        if (Kind == VariableKind::Local || Kind == VariableKind::Formal ||
+            Kind == VariableKind::Param)
+            return true;
     }
-    const bool IsPlain = pTerm->Op == Operator::Number || pTerm->Op == Operator::Variable ||
-                         pTerm->Op == Operator::Element || pTerm->Op == Operator::Add ||
-                         pTerm->Op == Operator::Subtract;
-    const bool IsCopy = pTerm->Op == Operator::Cast && !pTerm->pLeft->pLeft &&
-                        !pTerm->pType->SaturatesHigh && !pTerm->pType->SaturatesLow;
-    Folds = Folds || !(IsPlain || IsCopy);
-    for (const Term* pOperand : {pTerm->pLeft, pTerm->pRight})
-        if (pOperand && !(ReadsOwn && Folds))
-            mayLoseReads(pOperand, ReadsOwn, Folds);
-    return ReadsOwn && Folds;
+    return (pTerm->pLeft && readsOwn(pTerm->pLeft)) || (pTerm->pRight && readsOwn(pTerm->pRight));
+}
+
+/// A read that no store but one to a bool, and no condition, decides: the type's numbers are on
+/// both sides of zero or include it.
+bool isPlainRead(const Term* pTerm) {
+    if (pTerm->Op != Operator::Variable)
+        return false;
+    const Type& Of = *declarationOf(pTerm->pVariable)->pType;
+    return !isScaled(Of) && !Of.HasRange;
+}
+
+/// Part of a sum whose range is many numbers, however it is converted to an integer.
+bool isPlainSummand(const Term* pTerm) {
+    constexpr double Greatest = 65536.0;
+    if (pTerm->Op == Operator::Number)
+        return pTerm->Number >= -Greatest && pTerm->Number <= Greatest;
+    return isPlainRead(pTerm) && !isFloating(declarationOf(pTerm->pVariable)->pType->Base);
+}
+
+/// The shapes that most terms have, in which every read is written. For any other the text tells.
+bool keepsReads(const Term* pTerm, bool IsStored) {
+    const bool IsPlainCast = pTerm->Op == Operator::Cast && IsStored && !isScaled(*pTerm->pType) &&
+                             !pTerm->pType->HasRange && pTerm->pType->Base != BaseType::Bool;
+    if (IsPlainCast)
+        pTerm = pTerm->pLeft;
+    if (pTerm->Op == Operator::Number || isPlainRead(pTerm))
+        return true;
+    return IsPlainCast && (pTerm->Op == Operator::Add || pTerm->Op == Operator::Subtract) &&
+           isPlainSummand(pTerm->pLeft) && isPlainSummand(pTerm->pRight);
 }
 
 } // namespace
 
 template <class Write>
-void VariableUse::addReads(int Function, const Term* pTerm, Write&& write) {
-    bool ReadsOwn = false;
-    bool Folds = false;
-    if (!mayLoseReads(pTerm, ReadsOwn, Folds))
+void VariableUse::addReads(int Function, const Term* pTerm, bool IsStored, Write&& write) {
+    if (keepsReads(pTerm, IsStored) || !readsOwn(pTerm))
         return forEachRead(pTerm, [&](const Variable* pVariable) { addRead(Function, pVariable); });
     m_Scratch.clear();
-    const NoNames Names;
+    const NumberNames Names;
     ExpressionWriter Writer(Names, m_Scratch);
     write(Writer);
     for (const Variable* pVariable : Writer.getReads())
@@ -97,28 +125,29 @@ void VariableUse::addReads(int Function, const Term* pTerm, Write&& write) {
 }
 
 void VariableUse::addArgument(int Function, const Term* pTerm, const Variable* pFormal) {
-    addReads(Function, pTerm,
+    addReads(Function, pTerm, true,
              [&](ExpressionWriter& Writer) { Writer.writeStored(pTerm, *pFormal->pType, true); });
 }
 
 void VariableUse::add(int Function, const ProcedureFlow& Flow) {
     for (const FlowItem& Item : Flow.Items) {
+        const bool IsAssigned = Item.Kind == FlowItemKind::Assign;
         if (Item.pTerm)
-            addReads(Function, Item.pTerm, [&](ExpressionWriter& Writer) {
+            addReads(Function, Item.pTerm, IsAssigned, [&](ExpressionWriter& Writer) {
                 if (Item.pTerm->IsStore)
                     Writer.writeElement(*Item.pTarget, Item.pTerm->pLeft);
                 const Term* pValue = Item.pTerm->IsStore ? Item.pTerm->pRight : Item.pTerm;
-                if (Item.Kind == FlowItemKind::Assign)
+                if (IsAssigned)
                     Writer.writeStored(pValue, *Item.pTarget->pType, true);
                 else
                     Writer.writeDiscarded(pValue);
             });
-        if (Item.pTarget && Item.Kind == FlowItemKind::Assign)
+        if (Item.pTarget && IsAssigned)
             addWrite(Function, Item.pTarget);
     }
     for (const BranchTests& Tests : Flow.Tests)
         for (const BranchTest& Test : Tests)
-            addReads(Function, Test.pTerm,
+            addReads(Function, Test.pTerm, false,
                      [&](ExpressionWriter& Writer) { Writer.writeCondition(Test.pTerm, false); });
 }
 

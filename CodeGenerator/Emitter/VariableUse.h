@@ -38,7 +38,7 @@ private:
     };
 
     template <class Write>
-    void addReads(int Function, const Term* pTerm, Write&& write);
+    void addReads(int Function, const Term* pTerm, bool IsStored, Write&& write);
 
     Record& note(int Function, const Variable* pVariable);
     Record recordOf(const Variable* pVariable) const {

@@ -1,4 +1,5 @@
 #include "DriverTestSupport.h"
+#include "ReaderTestSupport.h"
 
 #include <gtest/gtest.h>
 
@@ -16,42 +17,6 @@ const char* const Small = "input uint8 key;\n"
                           "  if (LOUD) { lamp = 9; } else { lamp = 3; }\n"
                           "  if (key == 1) { count = count + 1; }\n"
                           "}\n";
-
-// The program that every user meets first.
-const char* const Cruise = R"(// Cruise control: one pass of main is one step of the controller.
-type Speed   = uint16 lsb 0.01 offset 0 range [0, 300] saturate;   // km/h
-type Percent = uint8  lsb 0.5           range [0, 100] saturate;
-
-input  Speed   vehicle_speed;              // changes outside at any time: volatile
-input  bool    brake;
-input  uint8   button;                     // 0 none, 1 set, 2 resume, 3 off
-output Percent throttle   = 0;
-state  Speed   target     = 0;
-state  float64 integral   = 0.0;
-state  bool    active     = false;
-state  uint8   history[8];                 // an array: its elements are not tracked
-param  bool    HAS_RESUME = false;         // option of this vehicle line; never assigned
-param  float64 KP = 0.8;
-param  float64 KI = 0.05;
-
-extern log_event reads(target, active) writes(history);
-
-proc main() {
-  if (brake || button == 3)                { active = false; log_event(); }
-  else if (button == 1)                    { target = vehicle_speed; active = true; }
-  else if (HAS_RESUME && button == 2)      { active = true; }
-  if (active) { regulate(target - vehicle_speed); }
-  else        { throttle = 0; integral = 0.0; }
-}
-
-proc regulate(float64 error) {
-  local uint8 i = 0;
-  integral = integral + KI * error;
-  while (i < 8) { history[i] = history[i] / 2; i = i + 1; }
-  if (integral > 50.0) { integral = 50.0; } else if (integral < -50.0) { integral = -50.0; }
-  throttle = max(0.0, KP * error + integral);
-}
-)";
 
 bool contains(const std::string& Text, const std::string& Part) {
     return Text.find(Part) != std::string::npos;
@@ -225,7 +190,7 @@ TEST(Driver, RunsUnderDifferentAddressesGiveIdenticalBytes) {
     std::map<std::string, std::string> First;
     for (const char* Before : Surroundings) {
         DriverRun Run;
-        Run.write("cruise.hpn", Cruise);
+        Run.write("cruise.hpn", sampleText());
         std::filesystem::create_directory(Run.directory() + "/out");
         ASSERT_EQ(Run.run("cruise.hpn -o out/cruise.c --dump-dot=out --dump-html=out "
                           "--stats --ranges",
@@ -264,7 +229,7 @@ TEST(Driver, DumpsAreNamedByNumberAndPassAndNameEveryVariable) {
 
 TEST(Driver, CruiseControlLosesTheOptionThatThisVehicleLacks) {
     DriverRun Run;
-    Run.write("cruise.hpn", Cruise);
+    Run.write("cruise.hpn", sampleText());
     ASSERT_EQ(Run.run("cruise.hpn -o cruise.c --ranges --stats --check"), 0) << Run.errors();
     const std::string Code = Run.read("cruise.c");
     EXPECT_FALSE(contains(Code, "HAS_RESUME")) << Code;

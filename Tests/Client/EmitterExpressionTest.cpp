@@ -1,8 +1,8 @@
-#include "CRunner.h"
 #include "Emitter/CLiterals.h"
 #include "Emitter/ExpressionWriter.h"
 #include "Model/Conversion.h"
 #include "Model/ZfCCfgSFVariable.h"
+#include "Oracles/CRunner.h"
 #include "ZfCSSAControl.h"
 
 #include <gtest/gtest.h>

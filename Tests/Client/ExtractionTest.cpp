@@ -1,9 +1,9 @@
 // Labels that become procedures, and those that must not.
 
+#include "Generators/RandomProgram.h"
 #include "Graph/LabelExtraction.h"
-#include "GraphShape.h"
-#include "ProgramComparison.h"
-#include "RandomProgram.h"
+#include "Oracles/GraphShape.h"
+#include "Oracles/ProgramComparison.h"
 #include "Road/Statistics.h"
 
 #include <gtest/gtest.h>
@@ -25,7 +25,7 @@ struct Extracted {
         EXPECT_TRUE(readProgram(Sources, Messages, Source)) << Messages.print();
         ProgramGraph Program(Source);
         LabelExtraction(Program).run();
-        test::checkShape(Program);
+        EXPECT_EQ(test::shapeFaults(Program), "");
         ZfCControlFlowGraph& Graph = Program.getGraph();
         for (leda::node v : Graph.all_nodes()) {
             const std::string Name = Graph[v]->getProcedure()->getName().cstring();
@@ -164,7 +164,7 @@ TEST(Extraction, RandomProgramsKeepShapeAndOutputs) {
     for (unsigned Batch = 0; Batch < 2; ++Batch) {
         ProgramComparison Comparison;
         for (unsigned i = 0; i < 15; ++i) {
-            const std::string Text = RandomProgram(7000 + Batch * 15 + i).text();
+            const std::string Text = hpn::fuzz::RandomProgram(7000 + Batch * 15 + i).text();
             const Extracted Result(Text);
             Procedures += Result.Procedures.empty() ? 0 : 1;
             Remarks += Result.Remarks.empty() ? 0 : 1;

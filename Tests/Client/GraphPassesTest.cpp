@@ -1,9 +1,10 @@
 // Random programs through the passes: whatever ran, the graph read by original variables writes the
 // same outputs as the syntax tree.
 
-#include "GraphRandomProgram.h"
+#include "Generators/GraphRandomProgram.h"
+#include "Generators/ModelTestNumbers.h"
 #include "Model/HoistingContext.h"
-#include "ModelTestNumbers.h"
+#include "Oracles/TreeRunner.h"
 
 #include <gtest/gtest.h>
 

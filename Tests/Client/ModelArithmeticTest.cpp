@@ -1,9 +1,9 @@
 // The number model's arithmetic against two judges: exact integer arithmetic written another way,
 // and the operators of the library's lattice values.
 
+#include "Generators/ModelTestNumbers.h"
 #include "Model/Arithmetic.h"
 #include "Model/Term.h"
-#include "ModelTestNumbers.h"
 
 #include <gtest/gtest.h>
 

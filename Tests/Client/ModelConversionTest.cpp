@@ -1,9 +1,9 @@
 // Conversions of numbers against wide arithmetic, of ranges against all their numbers, and both
 // against the library's setters.
 
+#include "Generators/ModelTestNumbers.h"
 #include "Model/Conversion.h"
 #include "Model/ZfCCfgSFVariable.h"
-#include "ModelTestNumbers.h"
 
 #include <gtest/gtest.h>
 

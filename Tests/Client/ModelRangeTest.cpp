@@ -1,9 +1,9 @@
 // Interval arithmetic against all numbers of small domains: never too narrow, and as narrow as an
 // interval can be.
 
+#include "Generators/ModelTestNumbers.h"
 #include "Model/Term.h"
 #include "Model/ValueRange.h"
-#include "ModelTestNumbers.h"
 
 #include <gtest/gtest.h>
 

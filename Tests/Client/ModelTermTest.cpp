@@ -1,9 +1,10 @@
 // Terms and the expression class over them: folding, ranges, values, and what a condition tells
 // about a variable.
 
-#include "GraphTestProgram.h"
+#include "Generators/GraphTestProgram.h"
+#include "Generators/ModelTestNumbers.h"
 #include "Model/PendingWarnings.h"
-#include "ModelTestNumbers.h"
+#include "Oracles/TreeRunner.h"
 #include "ZfCSSAControl.h"
 
 #include <gtest/gtest.h>

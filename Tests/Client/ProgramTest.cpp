@@ -1,5 +1,5 @@
-#include "ProgramComparison.h"
-#include "RandomProgram.h"
+#include "Generators/RandomProgram.h"
+#include "Oracles/ProgramComparison.h"
 
 #include <gtest/gtest.h>
 
@@ -56,7 +56,7 @@ TEST(Program, RandomProgramsKeepTheirOutputs) {
     for (unsigned Batch = First; Batch < End; Batch += BatchSize) {
         ProgramComparison Comparison;
         for (unsigned Seed = Batch; Seed < std::min(Batch + BatchSize, End); ++Seed) {
-            const std::string Text = RandomProgram(Seed).text();
+            const std::string Text = hpn::fuzz::RandomProgram(Seed).text();
             std::string Messages;
             const PassSequence Passes =
                 Seed % 4 == 3 ? randomPasses(Seed) : PassSequence::defaultOrder();

@@ -1,4 +1,4 @@
-#include "RandomProgram.h"
+#include "Generators/RandomProgram.h"
 #include "ReaderTestSupport.h"
 
 #include <gtest/gtest.h>
@@ -132,7 +132,7 @@ TEST(ReaderBroken, ChangedWordsAreAcceptedOrReported) {
     for (const std::string& Text : goodTexts())
         Texts.push_back(splitWords(Text));
     for (unsigned Seed = 0; Seed < 20; ++Seed)
-        Texts.push_back(splitWords(RandomProgram(Seed).text()));
+        Texts.push_back(splitWords(hpn::fuzz::RandomProgram(Seed).text()));
     for (int Try = 0; Try < 4000; ++Try) {
         const std::string Text = mutateWords(Texts[Random() % Texts.size()], Random);
         ASSERT_EQ(judge(Text), "") << Text;
@@ -142,7 +142,8 @@ TEST(ReaderBroken, ChangedWordsAreAcceptedOrReported) {
 TEST(ReaderBroken, WordsInAnyOrderAreAcceptedOrReported) {
     std::mt19937 Random(3);
     for (int Try = 0; Try < 500; ++Try) {
-        std::vector<std::string> Words = splitWords(inMain(RandomProgram(Random() % 100).text()));
+        std::vector<std::string> Words =
+            splitWords(inMain(hpn::fuzz::RandomProgram(Random() % 100).text()));
         Words.resize(20 + Random() % 200);
         std::shuffle(Words.begin() + 1, Words.end(), Random);
         std::string Text = Try % 2 == 0 ? "" : "proc main() { ";
@@ -169,7 +170,7 @@ TEST(ReaderBroken, PrintedProgramsReadBackTheSame) {
         EXPECT_EQ(Difference, "");
     }
     for (unsigned Seed = 0; Seed < 300; ++Seed) {
-        const std::string Text = RandomProgram(Seed).text();
+        const std::string Text = hpn::fuzz::RandomProgram(Seed).text();
         std::string Difference;
         EXPECT_TRUE(printsAndReadsBack(Text, Difference)) << printed(Text) << Text;
         ASSERT_EQ(Difference, "");

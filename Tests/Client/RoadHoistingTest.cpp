@@ -1,6 +1,6 @@
 // Equal code in both arms of a branch: what moves in front of it and what must not.
 
-#include "ProgramComparison.h"
+#include "Oracles/ProgramComparison.h"
 #include "Road/Statistics.h"
 
 #include <gtest/gtest.h>

@@ -2,13 +2,13 @@
 // C texts that come out, as many as differ, are compiled into one program, driven with the same
 // inputs, and compared step by step with the program as written.
 
-#include "CRunner.h"
 #include "DriverTestSupport.h"
 #include "Emitter/CEmitter.h"
 #include "Emitter/CLiterals.h"
 #include "Graph/ProgramGraph.h"
 #include "Language/Reader.h"
 #include "Model/Conversion.h"
+#include "Oracles/CRunner.h"
 #include "Road/PassRunner.h"
 
 #include <gtest/gtest.h>

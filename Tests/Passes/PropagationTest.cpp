@@ -2,8 +2,8 @@
 
 #include <cmath>
 
-#include "SSAVerifier.h"
-#include "TestClient.h"
+#include "LibraryClient/TestClient.h"
+#include "Oracles/SSAVerifier.h"
 
 namespace passes {
 namespace {

@@ -3,8 +3,8 @@
 #include <random>
 #include <set>
 
-#include "SSAVerifier.h"
-#include "TestClient.h"
+#include "LibraryClient/TestClient.h"
+#include "Oracles/SSAVerifier.h"
 
 namespace passes {
 namespace {

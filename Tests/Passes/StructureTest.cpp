@@ -1,6 +1,6 @@
 #include <gtest/gtest.h>
 
-#include "TestClient.h"
+#include "LibraryClient/TestClient.h"
 
 namespace passes {
 namespace {

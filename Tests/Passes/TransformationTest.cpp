@@ -1,7 +1,7 @@
 #include <gtest/gtest.h>
 
-#include "SSAVerifier.h"
-#include "TestClient.h"
+#include "LibraryClient/TestClient.h"
+#include "Oracles/SSAVerifier.h"
 
 namespace passes {
 namespace {

@@ -1,5 +1,5 @@
-#ifndef PASSES_SSAVERIFIER_H
-#define PASSES_SSAVERIFIER_H
+#ifndef SSAVERIFIER_H
+#define SSAVERIFIER_H
 
 // Verifies that a graph is in SSA form, at any time between transformToSSAForm and the end of the
 // run, with several items in a node or one. It knows nothing of the client's classes. The

@@ -1,7 +1,10 @@
 #ifndef GRAPHRANDOMPROGRAM_H
 #define GRAPHRANDOMPROGRAM_H
 
-#include "GraphTestProgram.h"
+#include "Generators/GraphTestProgram.h"
+
+#include <random>
+#include <vector>
 
 namespace hpn::test {
 
@@ -66,14 +69,24 @@ private:
         if (Height == 0 || pick(4) == 0)
             return leaf();
         if (pick(6) == 0)
-            return op(static_cast<Operator>(static_cast<unsigned>(Operator::Negate) + pick(5)),
-                      expression(Height - 1));
+            return unary(Height);
         if (pick(8) == 0)
-            return op(Operator::Cast, expression(Height - 1), nullptr,
-                      pick(2) == 0 ? &m_Clipped : Tree.builtIn(static_cast<BaseType>(pick(9))));
+            return cast(Height);
         Expression* pLeft = expression(Height - 1);
+        Expression* pRight = expression(Height - 1);
         return op(static_cast<Operator>(static_cast<unsigned>(Operator::Multiply) + pick(20)),
-                  pLeft, expression(Height - 1));
+                  pLeft, pRight);
+    }
+    // Each draw has a statement of its own: arguments are evaluated in no fixed order.
+    Expression* unary(int Height) {
+        Expression* pOperand = expression(Height - 1);
+        return op(static_cast<Operator>(static_cast<unsigned>(Operator::Negate) + pick(5)),
+                  pOperand);
+    }
+    Expression* cast(int Height) {
+        Expression* pOperand = expression(Height - 1);
+        return op(Operator::Cast, pOperand, nullptr,
+                  pick(2) == 0 ? &m_Clipped : Tree.builtIn(static_cast<BaseType>(pick(9))));
     }
     Expression* condition() {
         Variable& Tested = *m_Read[pick(static_cast<unsigned>(m_Read.size()))];
@@ -82,9 +95,10 @@ private:
             return read(Tested);
         case 1:
             return op(Operator::LogicalNot, read(Tested));
-        case 2:
-            return op(pick(2) == 0 ? Operator::Equal : Operator::NotEqual, read(Tested),
-                      number(pick(4)));
+        case 2: {
+            const Operator Op = pick(2) == 0 ? Operator::Equal : Operator::NotEqual;
+            return op(Op, read(Tested), number(pick(4)));
+        }
         default:
             return expression(2);
         }
@@ -96,19 +110,25 @@ private:
         return list(Statements);
     }
     Statement* simple() {
-        if (pick(6) == 0)
-            return assign(*m_pArray, expression(2), expression(1),
+        if (pick(6) == 0) {
+            Expression* pValue = expression(2);
+            Expression* pIndex = expression(1);
+            return assign(*m_pArray, pValue, pIndex,
                           pick(2) == 0 ? Operator::Add : Operator::Number);
+        }
         Variable& Target =
             *m_Written[pick(3) == 0 ? pick(2) : pick(static_cast<unsigned>(m_Written.size()))];
-        return assign(Target, pick(3) == 0 ? number(pick(3)) : expression(2), nullptr,
+        Expression* pValue = pick(3) == 0 ? number(pick(3)) : expression(2);
+        return assign(Target, pValue, nullptr,
                       pick(5) == 0 ? Operator::Multiply : Operator::Number);
     }
     Statement* branch(int Depth) {
         Expression* pCondition = condition();
-        if (pick(3) != 0)
-            return statement(StatementKind::If, pCondition, block(2, Depth - 1),
+        if (pick(3) != 0) {
+            Statement* pThen = block(2, Depth - 1);
+            return statement(StatementKind::If, pCondition, pThen,
                              block(static_cast<int>(pick(3)), Depth - 1));
+        }
         // Equal statements at the top of both arms.
         Variable& Target = *m_Written[pick(static_cast<unsigned>(m_Written.size()))];
         Variable& Source = *m_Written[pick(static_cast<unsigned>(m_Written.size()))];
@@ -118,6 +138,11 @@ private:
         Statement* pThen = arm();
         return statement(StatementKind::If, pCondition, pThen, arm());
     }
+    Statement* leaveOrRepeat() {
+        Expression* pCondition = condition();
+        return statement(StatementKind::If, pCondition,
+                         statement(pick(2) == 0 ? StatementKind::Break : StatementKind::Continue));
+    }
     Statement* loop(int Depth) {
         Variable& Counter = variable(VariableKind::Local, "i", BaseType::UInt8, m_pOwner);
         Statement* pStart = statement(StatementKind::LocalDecl);
@@ -126,10 +151,7 @@ private:
         Statement* pCount = assign(Counter, number(1), nullptr, Operator::Add);
         Statement* pBody = block(2, Depth - 1);
         if (pick(3) == 0)
-            pBody = list({statement(StatementKind::If, condition(),
-                                    statement(pick(2) == 0 ? StatementKind::Break
-                                                           : StatementKind::Continue)),
-                          statement(StatementKind::Block, nullptr, pBody)});
+            pBody = list({leaveOrRepeat(), statement(StatementKind::Block, nullptr, pBody)});
         if (pick(2) == 0) {
             Statement* pFor = statement(StatementKind::For, pCondition, pBody);
             pFor->pInit = pStart;
@@ -150,7 +172,8 @@ private:
             if (pick(2) == 0)
                 Body.push_back(statement(StatementKind::Break));
         }
-        return statement(StatementKind::Switch, expression(1), list(Body));
+        Expression* pSelector = expression(1);
+        return statement(StatementKind::Switch, pSelector, list(Body));
     }
     Statement* anyStatement(int Depth) {
         switch (Depth > 0 ? pick(9) : 8) {
@@ -165,14 +188,16 @@ private:
             if (m_Callable.empty())
                 return simple();
             Procedure& Callee = *m_Callable[pick(static_cast<unsigned>(m_Callable.size()))];
-            return call(Callee, {expression(1)}, pick(2) == 0 ? m_Written[pick(5)] : nullptr);
+            Expression* pArgument = expression(1);
+            return call(Callee, {pArgument}, pick(2) == 0 ? m_Written[pick(5)] : nullptr);
         }
         case 5: {
             if (m_pOwner->pResult == nullptr)
                 return simple();
             Statement* pReturn = statement(StatementKind::Return);
             pReturn->pValue = expression(1);
-            return statement(StatementKind::If, condition(), pReturn);
+            Expression* pCondition = condition();
+            return statement(StatementKind::If, pCondition, pReturn);
         }
         default:
             return simple();

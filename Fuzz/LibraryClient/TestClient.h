@@ -1,5 +1,5 @@
-#ifndef PASSES_TESTCLIENT_H
-#define PASSES_TESTCLIENT_H
+#ifndef TESTCLIENT_H
+#define TESTCLIENT_H
 
 // A client in small, by which the passes are tested: variables, expressions and statements that do
 // just what the library asks of them, and Program, which makes a graph from a short text or node by

@@ -50,7 +50,7 @@ private:
 
     void declareTypes();
     void declareGlobals();
-    void declare(const char* pKind, const std::string& Type, bool HasInitial);
+    void declare(const char* pKind, const std::string& Type);
     void declareExterns();
     void chooseCallees();
     void writeCallee(std::size_t Number);

@@ -1,5 +1,5 @@
-#ifndef PASSES_INTERPRETER_H
-#define PASSES_INTERPRETER_H
+#ifndef INTERPRETER_H
+#define INTERPRETER_H
 
 // Runs the program in a graph of the test client, before SSA form or in it, and collects what it
 // hands out at its end.
@@ -14,7 +14,7 @@
 #include <string>
 #include <vector>
 
-#include "TestClient.h"
+#include "LibraryClient/TestClient.h"
 
 namespace passes {
 

@@ -1,38 +1,17 @@
 #ifndef PROGRAMCOMPARISON_H
 #define PROGRAMCOMPARISON_H
 
-#include "CRunner.h"
 #include "Emitter/CEmitter.h"
 #include "Emitter/CLiterals.h"
 #include "Graph/ProgramGraph.h"
-#include "Language/Diagnostics.h"
-#include "Language/Reader.h"
-#include "Language/SourceFiles.h"
 #include "Model/Conversion.h"
+#include "Oracles/CRunner.h"
+#include "Oracles/ReadText.h"
 #include "Road/PassRunner.h"
 #include "Road/PassSequence.h"
 
 #include <sstream>
 #include <string>
-
-/// One program text, read. Keeps the sources, into which the program points.
-class ReadText {
-public:
-    explicit ReadText(const std::string& Text) : m_Messages(m_Sources) {
-        m_Sources.add("test.hpn", Text);
-        m_IsRead = hpn::readProgram(m_Sources, m_Messages, m_Program);
-    }
-
-    /// Null if it is not accepted.
-    const hpn::Program* program() const { return m_IsRead ? &m_Program : nullptr; }
-    std::string messages() const { return m_Messages.print(); }
-
-private:
-    hpn::SourceFiles m_Sources;
-    hpn::Diagnostics m_Messages;
-    hpn::Program m_Program;
-    bool m_IsRead = false;
-};
 
 /// Builds one C program out of many control programs, each in two variants: as it was built and
 /// after the given passes. It drives both with the same inputs, lets externs write the same values,
@@ -42,11 +21,11 @@ class ProgramComparison {
 public:
     /// False, with messages, if the text is not accepted.
     bool add(const std::string& Text, const hpn::PassSequence& Passes, std::string& Messages) {
-        const ReadText Read(Text);
+        const ReadText Read({{"test.hpn", Text}});
         Messages = Read.messages();
-        if (!Read.program())
+        if (!Read.isRead())
             return false;
-        const hpn::Program& Source = *Read.program();
+        const hpn::Program& Source = Read.program();
         const std::string Stem = "p" + std::to_string(m_Count++);
         const std::string Before = emit(Source, Stem + "a_", hpn::PassSequence());
         const std::string After = emit(Source, Stem + "b_", Passes);

@@ -1,4 +1,6 @@
-#include "PointedProgram.h"
+#include "Generators/PointedProgram.h"
+
+#include "Generators/Join.h"
 
 #include <iterator>
 
@@ -80,13 +82,13 @@ void PointedProgram::declareTypes() {
 
 void PointedProgram::declareGlobals() {
     for (std::uint64_t i = 1 + below(3); i > 0; --i)
-        declare("input", m_Types[below(m_Types.size())], false);
+        declare("input", m_Types[below(m_Types.size())]);
     for (std::uint64_t i = 1 + below(3); i > 0; --i)
-        declare("output", m_Types[below(m_Types.size())], oneIn(2));
+        declare("output", m_Types[below(m_Types.size())]);
     for (std::uint64_t i = 1 + below(4); i > 0; --i)
-        declare("state", m_Types[below(m_Types.size())], oneIn(2));
+        declare("state", m_Types[below(m_Types.size())]);
     if (oneIn(2))
-        declare("state", "bool", oneIn(2));
+        declare("state", "bool");
     line("param bool OFF = false;");
     for (std::uint64_t i = 1 + below(3); i > 0; --i) {
         const std::string Value = std::to_string(below(4));
@@ -101,12 +103,13 @@ void PointedProgram::declareGlobals() {
     }
 }
 
-void PointedProgram::declare(const char* pKind, const std::string& Type, bool HasInitial) {
-    const std::string Name = fresh(pKind[0] == 'i' ? "in" : pKind[0] == 'o' ? "out" : "s");
+void PointedProgram::declare(const char* pKind, const std::string& Type) {
+    const bool IsInput = pKind[0] == 'i';
+    const std::string Name = fresh(IsInput ? "in" : pKind[0] == 'o' ? "out" : "s");
     line(std::string(pKind) + " " + Type + " " + Name +
-         (HasInitial ? " = " + std::to_string(below(3)) : "") + ";");
+         (!IsInput && oneIn(2) ? " = " + std::to_string(below(3)) : "") + ";");
     m_Readable.push_back({Name, Type});
-    if (pKind[0] != 'i')
+    if (!IsInput)
         m_Writable.push_back({Name, Type});
 }
 
@@ -114,9 +117,9 @@ void PointedProgram::declareExterns() {
     if (!oneIn(3))
         return;
     m_Externs.push_back(fresh("outside"));
-    line("extern " + m_Externs.back() +
-         (oneIn(3) ? "" : " reads(" + pickNamed(m_Writable).Name + ")") +
-         (oneIn(2) ? "" : " writes(" + pickNamed(m_Writable).Name + ")") + ";");
+    line(join({"extern ", m_Externs.back(),
+               oneIn(3) ? "" : " reads(" + pickNamed(m_Writable).Name + ")",
+               oneIn(2) ? "" : " writes(" + pickNamed(m_Writable).Name + ")", ";"}));
 }
 
 void PointedProgram::chooseCallees() {
@@ -153,8 +156,8 @@ void PointedProgram::writeCallee(std::size_t Number) {
     ++m_Indent;
     for (std::size_t i = 0; i < Own.Formals.size(); ++i) {
         if (oneIn(2))
-            line("if (" + Own.Formals[i].Name + (oneIn(2) ? " == " : " > ") + Own.Favourites[i] +
-                 ") { " + pickNamed(m_Writable).Name + " = " + number() + "; }");
+            line(join({"if (", Own.Formals[i].Name, oneIn(2) ? " == " : " > ", Own.Favourites[i],
+                       ") { ", pickNamed(m_Writable).Name, " = ", number(), "; }"}));
     }
     --m_Indent;
     body(2, 4);
@@ -172,7 +175,7 @@ void PointedProgram::writeRecursion() {
     line("  if (left == 0 || left > 4) { return own; }");
     line("  local " + Type + " deeper = 0;");
     line("  deeper = again(left - 1, " + std::string(oneIn(2) ? "own" : "carried") + ");");
-    line("  " + pickNamed(m_Writable).Name + " = deeper " + pick({"+", "-", "&"}) + " own;");
+    line(join({"  ", pickNamed(m_Writable).Name, " = deeper ", pick({"+", "-", "&"}), " own;"}));
     line("  return own " + std::string(pick({"+", "*"})) + " carried;");
     line("}");
 }
@@ -184,9 +187,9 @@ void PointedProgram::writeMain() {
     body(3, 8);
     if (oneIn(3)) {
         // Several ways out.
-        line("  if (" + condition() + ") { " + pickNamed(m_Writable).Name + " = " + expression(1) +
-             "; return; }");
-        line("  " + pickNamed(m_Writable).Name + " = " + expression(1) + ";");
+        line(join({"  if (", condition(), ") { ", pickNamed(m_Writable).Name, " = ", expression(1),
+                   "; return; }"}));
+        line(join({"  ", pickNamed(m_Writable).Name, " = ", expression(1), ";"}));
     }
     line("}");
 }
@@ -222,8 +225,8 @@ void PointedProgram::statement(int Depth) {
     case 8: {
         const std::string Name = fresh("l");
         const std::string Type = m_Types[below(m_Types.size())];
-        line("local " + Type + " " + Name +
-             (oneIn(4) ? "" : " = " + (oneIn(2) ? numberOf(Type) : expression(1))) + ";");
+        line(join({"local ", Type, " ", Name,
+                   oneIn(4) ? "" : join({" = ", oneIn(2) ? numberOf(Type) : expression(1)}), ";"}));
         m_Readable.push_back({Name, Type});
         m_Writable.push_back({Name, Type});
         return;
@@ -254,8 +257,8 @@ void PointedProgram::deepStatement(int Depth) {
     case 10:
         return sameArms();
     case 11:
-        return line("if (" + condition() + ") { return" +
-                    (m_Result.empty() ? "" : " " + expression(1)) + "; }");
+        return line(join({"if (", condition(), ") { return",
+                          m_Result.empty() ? "" : " " + expression(1), "; }"}));
     case 12:
         return oneIn(4) ? endless() : call();
     default:
@@ -267,13 +270,13 @@ void PointedProgram::assign() {
     static const char* const Operators[] = {
         "=", "=", "=", "=", "+=", "-=", "*=", "/=", "%=", "<<=", ">>=", "&=", "|=", "^="};
     if (!m_Array.empty() && oneIn(6))
-        return line(m_Array + "[" + expression(1) + "] = " + expression(1) + ";");
-    line(pickNamed(m_Writable).Name + " " + pick(Operators) + " " + expression(2) + ";");
+        return line(join({m_Array, "[", expression(1), "] = ", expression(1), ";"}));
+    line(join({pickNamed(m_Writable).Name, " ", pick(Operators), " ", expression(2), ";"}));
 }
 
 void PointedProgram::assignConstant() {
     const Named Target = pickNamed(m_Writable);
-    line(Target.Name + " = " + (oneIn(3) ? number() : numberOf(Target.Type)) + ";");
+    line(join({Target.Name, " = ", oneIn(3) ? number() : numberOf(Target.Type), ";"}));
 }
 
 /// Only propagation sees that nothing changes; by another such state if there is one, so that it
@@ -300,17 +303,17 @@ void PointedProgram::copyBack() {
     const Named Second = pickNamed(m_Writable);
     line(First.Name + " = " + Second.Name + ";");
     if (oneIn(2))
-        line("if (" + First.Name + pick({" == ", " != ", " <= ", " > "}) + numberOf(Second.Type) +
-             ") { " + pickNamed(m_Writable).Name + " = " + First.Name +
-             pick({"", " + 1", " - 1", " * 2"}) + "; }");
+        line(join({"if (", First.Name, pick({" == ", " != ", " <= ", " > "}), numberOf(Second.Type),
+                   ") { ", pickNamed(m_Writable).Name, " = ", First.Name,
+                   pick({"", " + 1", " - 1", " * 2"}), "; }"}));
 }
 
 void PointedProgram::call() {
     if (!m_Externs.empty() && oneIn(3))
         return line(m_Externs.front() + "();");
     if (m_HasRecursion && oneIn(3))
-        return line(pickNamed(m_Writable).Name + " = again(" + std::to_string(below(4)) + ", " +
-                    expression(1) + ");");
+        return line(join({pickNamed(m_Writable).Name, " = again(", std::to_string(below(4)), ", ",
+                          expression(1), ");"}));
     if (m_FirstCallee >= m_Callees.size())
         return assign();
     callWith(m_Callees[m_FirstCallee + below(m_Callees.size() - m_FirstCallee)]);
@@ -320,7 +323,7 @@ void PointedProgram::callWith(const Callee& Called) {
     std::string Text = Called.Result.empty() || oneIn(4) ? "" : pickNamed(m_Writable).Name + " = ";
     Text += Called.Name + "(";
     for (std::size_t i = 0; i < Called.Formals.size(); ++i)
-        Text += (i == 0 ? "" : ", ") + (oneIn(3) ? expression(1) : Called.Favourites[i]);
+        Text += join({i == 0 ? "" : ", ", oneIn(3) ? expression(1) : Called.Favourites[i]});
     line(Text + ");");
 }
 
@@ -363,13 +366,13 @@ void PointedProgram::emptyArms() {
     case 0:
         return line(Inner);
     case 1:
-        return line("if (" + falseCondition() + ") { " + Inner + " } else { " + Target.Name +
-                    " = " + number() + "; }");
+        return line(join({"if (", falseCondition(), ") { ", Inner, " } else { ", Target.Name, " = ",
+                          number(), "; }"}));
     default:
-        line("if (" + falseCondition() + ") { " + Target.Name + " = " + number() + "; " + Inner +
-             " }");
-        return line("else { if (" + condition() + ") { " + Target.Name + " = " +
-                    numberOf(Target.Type) + "; } }");
+        line(join(
+            {"if (", falseCondition(), ") { ", Target.Name, " = ", number(), "; ", Inner, " }"}));
+        return line(join({"else { if (", condition(), ") { ", Target.Name, " = ",
+                          numberOf(Target.Type), "; } }"}));
     }
 }
 
@@ -380,7 +383,7 @@ void PointedProgram::loop(int Depth) {
     const std::uint64_t Kind = below(4);
     line("local uint8 " + Counter + " = 0;");
     m_Readable.push_back({Counter, "uint8"});
-    line(Kind == 0   ? "while (" + Test + (oneIn(3) ? " && " + condition() : "") + ") {"
+    line(Kind == 0   ? join({"while (", Test, oneIn(3) ? " && " + condition() : "", ") {"})
          : Kind == 1 ? std::string("do {")
          : Kind == 2 ? "for (; " + Test + "; " + Counter + "++) {"
                      : std::string("while (true) {"));
@@ -392,14 +395,14 @@ void PointedProgram::loop(int Depth) {
     body(m_LoopDepth > 1 ? 0 : Depth - 1, 3);
     --m_LoopDepth;
     if (oneIn(4))
-        line("  if (" + condition() + ") { " + pick({"break", "continue"}) + "; }");
+        line(join({"  if (", condition(), ") { ", pick({"break", "continue"}), "; }"}));
     if (oneIn(4))
-        line("  " + pickNamed(m_Writable).Name + " = " + expression(1) + ";");
+        line(join({"  ", pickNamed(m_Writable).Name, " = ", expression(1), ";"}));
     line(Kind == 1 ? "} while (" + Test + ");" : "}");
 }
 
 void PointedProgram::endless() {
-    const std::string Inner = pickNamed(m_Writable).Name + " = " + expression(1) + ";";
+    const std::string Inner = join({pickNamed(m_Writable).Name, " = ", expression(1), ";"});
     switch (below(3)) {
     case 0:
         return line("if (" + falseCondition() + ") { for (;;) { " + Inner + " } }");
@@ -409,9 +412,10 @@ void PointedProgram::endless() {
                     "; }");
     }
     default:
-        return line("if (" + condition() + " && " + condition() + ") { while (" +
-                    std::string(oneIn(2) ? "true" : m_Steady[0].Name + " == " + m_Steady[0].Type) +
-                    ") { " + Inner + " } }");
+        return line(
+            join({"if (", condition(), " && ", condition(), ") { while (",
+                  std::string(oneIn(2) ? "true" : m_Steady[0].Name + " == " + m_Steady[0].Type),
+                  ") { ", Inner, " } }"}));
     }
 }
 
@@ -422,9 +426,9 @@ void PointedProgram::jump(int Depth) {
     body(Depth - 1, 2);
     line("}");
     if (oneIn(2))
-        line("if (" + (oneIn(2) ? falseCondition() : condition()) + ") { " +
-             pickNamed(m_Writable).Name + " = " + number() + "; goto " + Label + "; }");
-    line(pickNamed(m_Writable).Name + " = " + number() + ";");
+        line(join({"if (", oneIn(2) ? falseCondition() : condition(), ") { ",
+                   pickNamed(m_Writable).Name, " = ", number(), "; goto ", Label, "; }"}));
+    line(join({pickNamed(m_Writable).Name, " = ", number(), ";"}));
     line(Label + ":");
     assign();
 }
@@ -442,13 +446,13 @@ void PointedProgram::switchStatement(int Depth) {
 }
 
 void PointedProgram::sameArms() {
-    const std::string Same = pickNamed(m_Writable).Name + " = " + expression(1) + ";";
+    const std::string Same = join({pickNamed(m_Writable).Name, " = ", expression(1), ";"});
     const std::string Second =
-        oneIn(2) ? " " + pickNamed(m_Writable).Name + " = " + number() + ";" : "";
-    line("if (" + condition() + ") { " + Same + Second + " " + pickNamed(m_Writable).Name + " = " +
-         number() + "; }");
-    line("else { " + Same + Second + " " + pickNamed(m_Writable).Name + " = " + expression(1) +
-         "; }");
+        oneIn(2) ? join({" ", pickNamed(m_Writable).Name, " = ", number(), ";"}) : "";
+    line(join({"if (", condition(), ") { ", Same, Second, " ", pickNamed(m_Writable).Name, " = ",
+               number(), "; }"}));
+    line(join(
+        {"else { ", Same, Second, " ", pickNamed(m_Writable).Name, " = ", expression(1), "; }"}));
 }
 
 // ---- expressions ----
@@ -473,12 +477,12 @@ std::string PointedProgram::condition() {
     switch (below(10)) {
     case 0:
     case 1:
-        return Tested.Name + pick({" == ", " != "}) + numberOf(Tested.Type);
+        return join({Tested.Name, pick({" == ", " != "}), numberOf(Tested.Type)});
     case 2:
         return pick({"", "!"}) + Tested.Name;
     case 3:
     case 4:
-        return Tested.Name + pick({" < ", " <= ", " > ", " >= "}) + numberOf(Tested.Type);
+        return join({Tested.Name, pick({" < ", " <= ", " > ", " >= "}), numberOf(Tested.Type)});
     case 5:
         return falseCondition();
     case 6:
@@ -520,14 +524,14 @@ std::string PointedProgram::expression(int Depth) {
     case 2:
         return !m_Array.empty() && oneIn(8) ? m_Array + "[" + readable() + "]" : readable();
     case 3:
-        return std::string(pick({"-", "!", "~"})) + "(" + expression(Depth - 1) + ")";
+        return join({pick({"-", "!", "~"}), "(", expression(Depth - 1), ")"});
     case 4:
-        return "(" + m_Types[below(m_Types.size())] + ") (" + expression(Depth - 1) + ")";
+        return join({"(", m_Types[below(m_Types.size())], ") (", expression(Depth - 1), ")"});
     case 5:
-        return std::string(pick({"abs", "sgn"})) + "(" + expression(Depth - 1) + ")";
+        return join({pick({"abs", "sgn"}), "(", expression(Depth - 1), ")"});
     case 6: {
         const std::string Left = expression(Depth - 1);
-        return std::string(pick({"min", "max"})) + "(" + Left + ", " + expression(Depth - 1) + ")";
+        return join({pick({"min", "max"}), "(", Left, ", ", expression(Depth - 1), ")"});
     }
     default: {
         const std::string Left = expression(Depth - 1);

@@ -1,11 +1,15 @@
 #ifndef RANDOMPROGRAM_H
 #define RANDOMPROGRAM_H
 
+#include "Generators/Join.h"
+
 #include <initializer_list>
 #include <random>
 #include <string>
 #include <utility>
 #include <vector>
+
+namespace hpn::fuzz {
 
 /// A program text out of a seed, over the whole language: every type, scaling and saturation,
 /// inputs, arrays, calls with parameters and results, a recursion, exported procedures, externs,
@@ -97,16 +101,16 @@ private:
         }
         for (int i = 0; i < 2; ++i) {
             m_Externs.push_back(fresh("outside"));
-            line("extern " + m_Externs.back() +
-                 (oneIn(3) ? "" : " reads(" + pick(m_Global.Writable) + ")") +
-                 (oneIn(2) ? "" : " writes(" + pick(m_Global.Writable) + ")") + ";");
+            line(join({"extern ", m_Externs.back(),
+                       oneIn(3) ? "" : " reads(" + pick(m_Global.Writable) + ")",
+                       oneIn(2) ? "" : " writes(" + pick(m_Global.Writable) + ")", ";"}));
         }
     }
 
     void declare(const std::string& Kind, const std::string& Type, bool IsWritable) {
         const std::string Name = fresh(Kind.substr(0, 2).c_str());
-        line(Kind + " " + Type + " " + Name +
-             (IsWritable && oneIn(2) ? " = " + pick({"0", "1", "20"}) : "") + ";");
+        line(join({Kind, " ", Type, " ", Name,
+                   IsWritable && oneIn(2) ? " = " + pick({"0", "1", "20"}) : "", ";"}));
         m_Global.Readable.push_back(Name);
         if (IsWritable)
             m_Global.Writable.push_back(Name);
@@ -170,7 +174,7 @@ private:
         m_FirstCallee = 0;
         m_HasResult = false;
         body(4);
-        lineIn(pick(m_Scope.Writable) + " = " + expression(2) + ";");
+        lineIn(join({pick(m_Scope.Writable), " = ", expression(2), ";"}));
         line("}");
     }
 
@@ -206,13 +210,13 @@ private:
         case 2:
             return assignment();
         case 3:
-            return line(m_Arrays[below(2)] + "[" + expression(1) + "] = " + expression(2) + ";");
+            return line(join({m_Arrays[below(2)], "[", expression(1), "] = ", expression(2), ";"}));
         case 4:
             return declareLocal();
         case 5:
-            return line(pick(m_Scope.Writable) + " " +
-                        pick({"+=", "-=", "*=", "/=", "%=", "<<=", ">>=", "&=", "|=", "^="}) + " " +
-                        expression(1) + ";");
+            return line(join({pick(m_Scope.Writable), " ",
+                              pick({"+=", "-=", "*=", "/=", "%=", "<<=", ">>=", "&=", "|=", "^="}),
+                              " ", expression(1), ";"}));
         case 6:
             return line(pick(m_Externs) + "();");
         case 7:
@@ -241,15 +245,16 @@ private:
         case 20:
             return leave();
         default:
-            return line(pick(m_Scope.Writable) + pick({"++", "--"}) + ";");
+            return line(join({pick(m_Scope.Writable), pick({"++", "--"}), ";"}));
         }
     }
 
-    void assignment() { line(pick(m_Scope.Writable) + " = " + expression(3) + ";"); }
+    void assignment() { line(join({pick(m_Scope.Writable), " = ", expression(3), ";"})); }
 
     void declareLocal() {
         const std::string Name = fresh("l");
-        line("local " + pick(m_Types) + " " + Name + (oneIn(4) ? "" : " = " + expression(2)) + ";");
+        line(
+            join({"local ", pick(m_Types), " ", Name, oneIn(4) ? "" : " = " + expression(2), ";"}));
         m_Scope.Readable.push_back(Name);
         m_Scope.Writable.push_back(Name);
     }
@@ -257,8 +262,8 @@ private:
     void call() {
         const int Callable = NumberOfProcedures - m_FirstCallee;
         if (m_CanRecurse && (Callable == 0 || oneIn(5)))
-            return line(pick(m_Scope.Writable) + " = again(" + std::to_string(below(4)) + ", " +
-                        expression(1) + ");");
+            return line(join({pick(m_Scope.Writable), " = again(", std::to_string(below(4)), ", ",
+                              expression(1), ");"}));
         if (Callable == 0)
             return assignment();
         const int Callee = m_FirstCallee + static_cast<int>(below(static_cast<unsigned>(Callable)));
@@ -266,7 +271,7 @@ private:
             m_Signatures[Callee].Result.empty() || oneIn(4) ? "" : pick(m_Scope.Writable) + " = ";
         Text += "p" + std::to_string(Callee) + "(";
         for (std::size_t i = 0; i < m_Signatures[Callee].Formals.size(); ++i)
-            Text += (i == 0 ? "" : ", ") + (oneIn(2) ? number() : expression(2));
+            Text += join({i == 0 ? "" : ", ", oneIn(2) ? number() : expression(2)});
         line(Text + ");");
     }
 
@@ -291,8 +296,8 @@ private:
         line("local uint8 " + Counter + " = 0;");
         m_Scope.Readable.push_back(Counter);
         if (Kind == 0)
-            line("while (" + Counter + " < " + Bound + (oneIn(2) ? " && " + condition() : "") +
-                 ") {");
+            line(join(
+                {"while (", Counter, " < ", Bound, oneIn(2) ? " && " + condition() : "", ") {"}));
         else if (Kind == 1)
             line("do {");
         else
@@ -303,9 +308,9 @@ private:
         body(m_LoopDepth > 1 ? 0 : Depth - 1);
         --m_LoopDepth;
         if (oneIn(3))
-            lineIn("if (" + condition() + ") { " + pick({"break", "continue"}) + "; }");
+            lineIn(join({"if (", condition(), ") { ", pick({"break", "continue"}), "; }"}));
         if (oneIn(3))
-            lineIn(pick(m_Scope.Writable) + " = " + expression(1) + ";");
+            lineIn(join({pick(m_Scope.Writable), " = ", expression(1), ";"}));
         line(Kind == 1 ? "} while (" + Counter + " < " + Bound + ");" : "}");
     }
 
@@ -367,7 +372,7 @@ private:
         switch (below(4)) {
         case 0:
             line("if (OFF) {");
-            lineIn("while (true) { " + pick(m_Scope.Writable) + " = " + expression(1) + "; }");
+            lineIn(join({"while (true) { ", pick(m_Scope.Writable), " = ", expression(1), "; }"}));
             break;
         case 1:
             line("if (steady != 3) {");
@@ -385,7 +390,7 @@ private:
     }
 
     void sameInBothArms() {
-        const std::string Same = pick(m_Scope.Writable) + " = " + expression(2) + ";";
+        const std::string Same = join({pick(m_Scope.Writable), " = ", expression(2), ";"});
         line("if (" + condition() + ") {");
         lineIn(Same);
         body(0);
@@ -414,7 +419,7 @@ private:
     std::string condition() {
         switch (below(8)) {
         case 0:
-            return pick(m_Scope.Readable) + pick({" == ", " != "}) + number();
+            return join({pick(m_Scope.Readable), pick({" == ", " != "}), number()});
         case 1:
             return pick({"", "!"}) + m_Scope.Readable[0];
         case 2:
@@ -430,21 +435,22 @@ private:
         if (Kind == 0)
             return number();
         if (Kind < 3)
-            return oneIn(8) ? pick(m_Arrays) + "[" +
-                                  (Depth > 0 ? expression(Depth - 1) : pick(m_Scope.Readable)) + "]"
-                            : pick(m_Scope.Readable);
+            return oneIn(8)
+                       ? join({pick(m_Arrays), "[",
+                               Depth > 0 ? expression(Depth - 1) : pick(m_Scope.Readable), "]"})
+                       : pick(m_Scope.Readable);
         if (Kind == 3)
-            return pick({"-", "!", "~"}) + "(" + expression(Depth - 1) + ")";
+            return join({pick({"-", "!", "~"}), "(", expression(Depth - 1), ")"});
         if (Kind == 4)
-            return "(" + pick(m_Types) + ") (" + expression(Depth - 1) + ")";
+            return join({"(", pick(m_Types), ") (", expression(Depth - 1), ")"});
         if (Kind == 5)
-            return pick({"abs", "sgn"}) + "(" + expression(Depth - 1) + ")";
+            return join({pick({"abs", "sgn"}), "(", expression(Depth - 1), ")"});
         if (Kind == 6)
-            return pick({"min", "max"}) + "(" + expression(Depth - 1) + ", " +
-                   expression(Depth - 1) + ")";
+            return join({pick({"min", "max"}), "(", expression(Depth - 1), ", ",
+                         expression(Depth - 1), ")"});
         const std::string Op = pick({"+",  "-",  "*", "/", "%", "<<", ">>", "<", "<=", ">", ">=",
                                      "==", "!=", "&", "^", "|", "&&", "||", "+", "-",  "*"});
-        return "(" + expression(Depth - 1) + " " + Op + " " + expression(Depth - 1) + ")";
+        return join({"(", expression(Depth - 1), " ", Op, " ", expression(Depth - 1), ")"});
     }
 
     std::mt19937 m_Random;
@@ -462,5 +468,7 @@ private:
     bool m_HasResult = false;
     bool m_CanRecurse = true;
 };
+
+} // namespace hpn::fuzz
 
 #endif
