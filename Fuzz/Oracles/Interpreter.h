@@ -20,8 +20,8 @@ namespace passes {
 
 class Interpreter {
 public:
-    Interpreter(Program& P, unsigned int Seed, int Passes)
-        : m_P(P), m_Graph(P.graph()), m_Seed(Seed), m_Passes(Passes) {}
+    Interpreter(Program& P, unsigned int Seed, int Passes, int MostSteps = 20000)
+        : m_P(P), m_Graph(P.graph()), m_Seed(Seed), m_Passes(Passes), m_MostSteps(MostSteps) {}
 
     // The outputs in set order, then what went wrong.
     std::string run() {
@@ -42,7 +42,7 @@ private:
         leda::node v = m_P.procedure(Name)->getEntryNode();
         leda::edge Arrival = nullptr;
         while (m_Graph.inf(v)->isExitNode() == nullptr) {
-            if (++m_Steps > 20000) {
+            if (++m_Steps > m_MostSteps) {
                 m_Faults += "too many steps";
                 return;
             }
@@ -186,6 +186,7 @@ private:
     ZfCControlFlowGraph& m_Graph;
     unsigned int m_Seed;
     int m_Passes;
+    int m_MostSteps;
     int m_Steps = 0;
     int m_JoinPosition = 0; // of the last join that control came to
     bool m_IsSSA = false;

@@ -134,20 +134,6 @@ TEST(Frames, LoopAroundMainHasAnUnknownConditionAndBothWays) {
     EXPECT_EQ(P.blockOf(Loop)->getProcedure(), P.procedure("#main"));
 }
 
-TEST(Frames, ConsistencyAssertsEachRuleOfAComponent) {
-    Program P("proc main { x = 1; }");
-    leda::node Stray = P.block(); // a second node without in-edges, of the right procedure
-    P.edge(Stray, P.graph().target(P.graph().first_adj_edge(P.procedure("#main")->getEntryNode())));
-    Reports R(true);
-    EXPECT_TRUE(P.graph().checkConsistency());
-    P.blockOf(Stray)->setProcedure(nullptr);
-    EXPECT_TRUE(P.graph().checkConsistency());
-    EXPECT_EQ(Reports::assertions(),
-              (std::vector<std::string>{"v == EntryNode", "pInf->getProcedure() == pProcedure",
-                                        "v == EntryNode"}));
-    EXPECT_TRUE(R.Messages.empty());
-}
-
 // Entry -> c -(t)-> a -> Shared -> Behind, c -(f)-> Shared: one plain edge and one branch edge come
 // to Shared.
 struct SharedCode {
