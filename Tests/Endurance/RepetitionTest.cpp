@@ -9,6 +9,7 @@
 #include <filesystem>
 #include <fstream>
 #include <sstream>
+#include <unistd.h>
 #include <vector>
 
 namespace {
@@ -145,10 +146,7 @@ std::vector<std::string> dumpsOfRun(const std::filesystem::path& Directory, std:
 
 // Node, variable, version and block numbers are those of a fresh process in every run.
 TEST(Repetition, TheSecondClientOfAProcessSeesTheSameNumbers) {
-    const std::filesystem::path Directory =
-        std::filesystem::temp_directory_path() /
-        ("hpn_endurance_" + std::to_string(reinterpret_cast<std::size_t>(&wholeRoad) % 997) + "_" +
-         std::to_string(::testing::UnitTest::GetInstance()->random_seed()));
+    const std::filesystem::path Directory = "hpn_endurance_" + std::to_string(getpid());
     std::string Codes[2];
     const std::vector<std::string> First = dumpsOfRun(Directory, Codes[0]);
     const std::vector<std::string> Second = dumpsOfRun(Directory, Codes[1]);
