@@ -1,10 +1,26 @@
 #include "Driver/Options.h"
 #include "Driver/Session.h"
 
+#include <cstdio>
+#include <cstdlib>
 #include <exception>
+#include <new>
+
+namespace {
+
+// The optimiser goes on with a null object where a block is missing, and code with holes would come
+// out in the end. So the process ends before anybody sees the null; the output files are written at
+// once when all is done, and none has been begun.
+[[noreturn]] void endWithoutMemory() {
+    std::fputs("hpncg: error: out of memory\n", stderr);
+    std::_Exit(hpn::ExitInternalError);
+}
+
+} // namespace
 
 // The driver of the reference client: program text in, optimised C out.
 int main(int ArgumentCount, char** pArguments) {
+    std::set_new_handler(&endWithoutMemory);
     try {
         hpn::Options Wanted;
         hpn::ExitStatus Status = hpn::ExitDone;

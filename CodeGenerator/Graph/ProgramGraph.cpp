@@ -10,8 +10,21 @@ namespace hpn {
 
 ProgramGraph::ProgramGraph(const Program& Source) : m_Source(Source), m_Hidden(Source) {
     m_Control.boot();
+    try {
+        build();
+    } catch (...) { // memory has run out
+        takeDown();
+        throw;
+    }
+}
+
+ProgramGraph::~ProgramGraph() {
+    takeDown();
+}
+
+void ProgramGraph::build() {
     m_pGraph = std::make_unique<ZfCControlFlowGraph>();
-    for (const Procedure& Known : Source.Procedures) {
+    for (const Procedure& Known : m_Source.Procedures) {
         if (!Known.IsMain)
             m_Procedures.emplace(Known.Name, &Known);
     }
@@ -20,7 +33,7 @@ ProgramGraph::ProgramGraph(const Program& Source) : m_Source(Source), m_Hidden(S
 
 // The graph's end empties the factory, whose versions still name the client's variables; the
 // variables' sets of nodes use the library until they end.
-ProgramGraph::~ProgramGraph() {
+void ProgramGraph::takeDown() {
     for (int i = 0; i < m_ParkedEdges; ++i)
         ZfCCfgFactory::getInstance()->createEdgeInfo();
     m_pGraph.reset();

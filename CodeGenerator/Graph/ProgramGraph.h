@@ -92,6 +92,9 @@ public:
 
 private:
     friend class GraphBuilder;
+    void build();
+    void takeDown();
+
     const Program& m_Source;
     ZfCSSAControl m_Control;
     std::unique_ptr<ZfCControlFlowGraph> m_pGraph;
