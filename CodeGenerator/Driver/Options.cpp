@@ -72,6 +72,9 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
     App.add_option("--dump-html", Result.HtmlDirectory,
                    "Write the table of variables after each pass")
         ->type_name("DIR");
+    App.add_option("--record", Result.RecordFile,
+                   "Write everything about the run as JSON, for tools")
+        ->type_name("FILE");
     App.add_flag("--stats{text}", Given.Statistics,
                  "Print what each pass did; --stats=json for tools");
     App.add_flag("--time-passes", Result.IsTimeWanted, "Print how long each pass took");

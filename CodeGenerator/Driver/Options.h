@@ -20,6 +20,7 @@ struct Options {
     PassSequence Passes;
     std::string DotDirectory; ///< empty: no dump
     std::string HtmlDirectory;
+    std::string RecordFile; ///< the recording as JSON; empty: none
     StatisticsForm Statistics = StatisticsForm::None;
     bool IsTimeWanted = false;
     bool IsCheckWanted = false;

@@ -167,11 +167,12 @@ struct RecordedSnapshot {
     std::size_t Tally[5] = {}; ///< changes by RecordedChange::Kind
 };
 
-/// One step of an explanation; `Depth` indents it below what it explains.
+/// One line of an explanation. A line that names a version says what is known of it; that version's
+/// own explanation goes on from there (`unfoldExplanation` does that).
 struct RecordedReason {
     std::string Text;
     RecordedPlace Place; ///< where to look; may be unknown
-    unsigned Depth = 0;
+    int Version = -1;    ///< index into Versions
 };
 
 /// One SSA version of a variable, as the last propagation saw it.
@@ -185,7 +186,7 @@ struct RecordedVersion {
     RecordedPlace Place;
     RecordedRange Found;
     std::vector<RecordedPlace> Uses;         ///< in the program text, after the propagation
-    std::vector<RecordedReason> Explanation; ///< why it is constant, or why not
+    std::vector<RecordedReason> Explanation; ///< why it is constant, or why not: one step
 };
 
 /// One variable of the program, hidden ones included (their names are not in the text).
@@ -271,6 +272,16 @@ struct Recording {
     std::string CodeBefore; ///< C without any pass
     std::string CodeAfter;
 };
+
+/// A line of an explanation that has been followed to its end; `Depth` indents it below what it
+/// explains.
+struct ExplainedLine {
+    std::string Text;
+    RecordedPlace Place;
+    unsigned Depth = 0;
+};
+/// Follows the explanation of a version through the versions that it names, each one once.
+std::vector<ExplainedLine> unfoldExplanation(const Recording& Of, int Version);
 
 /// Words of the enumerations, as the JSON form writes them.
 const char* nameOf(RecordedRange::Kind Kind);

@@ -105,7 +105,7 @@ static Json toJson(const RecordedSnapshot& Snapshot) {
 }
 
 static Json toJson(const RecordedReason& Reason) {
-    return {{"text", Reason.Text}, {"place", toJson(Reason.Place)}, {"depth", Reason.Depth}};
+    return {{"text", Reason.Text}, {"place", toJson(Reason.Place)}, {"version", Reason.Version}};
 }
 
 static Json toJson(const RecordedVersion& Version) {
