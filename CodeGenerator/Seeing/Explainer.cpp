@@ -5,6 +5,7 @@
 #include "Model/ZfCCfgSFAssignment.h"
 #include "Model/ZfCCfgSFExpression.h"
 #include "Model/ZfCCfgSFProcedureCall.h"
+#include "Seeing/LoopHeads.h"
 
 #include <algorithm>
 
@@ -274,6 +275,7 @@ public:
         summarise();
         const RingFinder Rings(m_Target);
         m_pRings = &Rings.getRings();
+        m_IsLoopHead = findLoopHeads(m_Target);
         for (std::size_t i = 0; i < m_Target.Versions.size(); ++i)
             explain(static_cast<int>(i));
         m_pRings = nullptr;
@@ -393,11 +395,6 @@ private:
                        Of.Place);
         if (Of.Found.What == Kind::Constant)
             return explainConstant(Index);
-        if (Of.Found.What == Kind::Undetermined)
-            return say(Index,
-                       Of.Name + " has no value that is known of: what would give it one is "
-                                 "not reached, or hangs on itself alone",
-                       Of.Place);
         explainOther(Index);
     }
 
@@ -489,8 +486,8 @@ private:
 
     std::string notText(int Index) {
         const RecordedRange& Found = version(Index).Found;
-        const std::string Range =
-            Found.What == Kind::Range ? " (" + rangeText(Found) + ")" : std::string();
+        const bool IsTelling = Found.What == Kind::Range || Found.What == Kind::Undetermined;
+        const std::string Range = IsTelling ? " (" + rangeText(Found) + ")" : std::string();
         return version(Index).Name + " is not constant" + Range + ": ";
     }
 
@@ -532,20 +529,45 @@ private:
                 FirstOther = FirstOther < 0 ? Read.Version : FirstOther;
             }
         }
+        const bool IsCarried = FirstCarried >= 0 && m_IsLoopHead.count(By.Id) != 0;
+        if (IsCarried && FirstOther < 0)
+            return sayCarried(Index, By, FirstCarried);
         const int First = FirstOther >= 0 ? FirstOther : FirstCarried;
         if (First < 0)
             return say(Index, notText(Index) + "the ways that meet here bring different numbers",
                        By.Place);
-        const std::string Name = version(First).Name;
-        if (FirstOther >= 0) {
-            say(Index, notText(Index) + "one of the ways that meet here brings " + Name, By.Place);
-            return say(Index, isText(First), version(First).Place, First);
-        }
-        say(Index,
-            notText(Index) + "loop-carried, " + carriedText(By) + " brings " + Name +
-                ", which is made from it",
-            version(First).Place);
+        say(Index, notText(Index) + "one way that leads here brings " + version(First).Name,
+            By.Place);
         say(Index, isText(First), version(First).Place, First);
+    }
+
+    void sayCarried(int Index, const RecordedStatement& By, int Carried) {
+        say(Index,
+            notText(Index) + "loop-carried, " + carriedText(By) + " brings " +
+                version(Carried).Name + ", which is made from it",
+            By.Place);
+        const int Maker = findMaker(Index, Carried);
+        if (Maker >= 0)
+            say(Index, "`" + definitionOf(Maker).Text + "`", version(Maker).Place);
+    }
+
+    // The first assignment on the way from a carried value back to the join that carries it.
+    int findMaker(int Index, int Carried) {
+        constexpr unsigned Farthest = 64;
+        for (unsigned Steps = 0; Steps < Farthest && Carried != Index; ++Steps) {
+            const RecordedStatement& By = definitionOf(Carried);
+            if (By.Form == RecordedForm::Assignment)
+                return Carried;
+            int Next = -1;
+            for (const RecordedRead& Read : By.Reads)
+                if (Next < 0 && Read.Version >= 0 && Read.Version != Carried &&
+                    isOfSameRing(Index, Read.Version))
+                    Next = Read.Version;
+            if (Next < 0)
+                return -1;
+            Carried = Next;
+        }
+        return -1;
     }
 
     // A join that also takes the value before the first step is that of the loop around main.
@@ -606,6 +628,7 @@ private:
     StateReader& m_Reader;
     std::unordered_map<int, std::vector<Argument>> m_Arguments; // by version; looked up only
     const std::vector<int>* m_pRings = nullptr;
+    std::unordered_set<unsigned> m_IsLoopHead; // ids of joins
 };
 
 // How assignments meet the limits of their types

@@ -77,6 +77,23 @@ std::string_view trim(std::string_view Text) {
     return Text;
 }
 
+// So many nodes are looked at for a place; a statement beyond says little about where one stands.
+constexpr unsigned FarthestPlace = 64;
+
+// The node in front of or behind a node, if control flow knows just one.
+leda::node onlyNeighbour(ZfCControlFlowGraph& Graph, leda::node v, bool IsIn) {
+    leda::node Found = nullptr;
+    leda::edge e = IsIn ? Graph.first_in_edge(v) : Graph.first_adj_edge(v);
+    for (; e != nullptr; e = IsIn ? Graph.in_succ(e) : Graph.adj_succ(e)) {
+        if (Graph.inf(e)->isSSAEdge() != nullptr)
+            continue;
+        if (Found != nullptr)
+            return nullptr;
+        Found = IsIn ? Graph.source(e) : Graph.target(e);
+    }
+    return Found;
+}
+
 } // namespace
 
 StateReader::StateReader(Recording& Target, const SourceFiles& Sources, ProgramGraph& Program)
@@ -85,6 +102,7 @@ StateReader::StateReader(Recording& Target, const SourceFiles& Sources, ProgramG
         describeVariable(Program.getVariable(Each), false);
     for (const Variable& Each : Program.getHiddenVariables())
         describeVariable(Program.getVariable(Each), true);
+    chooseNames();
 }
 
 // Tables
@@ -97,8 +115,8 @@ void StateReader::describeVariable(ZfCCfgSFVariable* pVariable, bool IsHidden) {
     New.Name = Declared.Name;
     New.Owner = Declared.pOwner != nullptr ? std::string(Declared.pOwner->Name) : "";
     New.Kind = KindNames[static_cast<std::size_t>(Declared.Kind)];
-    if (Declared.Kind == VariableKind::Result && New.Name.empty())
-        New.Name = "result of " + New.Owner;
+    if (Declared.Kind == VariableKind::Result)
+        New.Name = "result"; // has no name in the text
     New.IsHidden = IsHidden;
     New.Type = Of.Name;
     New.Base = BaseNames[static_cast<std::size_t>(Of.Base)];
@@ -116,6 +134,18 @@ void StateReader::describeVariable(ZfCCfgSFVariable* pVariable, bool IsHidden) {
     New.Count = Declared.Count;
     New.Initial = Declared.Initial.empty() ? 0.0 : Declared.Initial.front();
     New.Place = placeOf(Declared.Position);
+}
+
+// Procedures may have locals of one name; those are told apart by the procedure's.
+void StateReader::chooseNames() {
+    std::unordered_map<std::string_view, unsigned> Uses;
+    for (const RecordedVariable& Each : m_Target.Variables)
+        ++Uses[Each.Name];
+    for (const RecordedVariable& Each : m_Target.Variables) {
+        const bool IsQualified = Each.Kind == "result" || Uses[Each.Name] > 1;
+        m_Names.push_back(IsQualified && !Each.Owner.empty() ? Each.Owner + "::" + Each.Name
+                                                             : Each.Name);
+    }
 }
 
 // The language knows no units, but a type's line often ends with one: `// km/h`. A longer comment
@@ -165,7 +195,7 @@ int StateReader::versionOf(ZfCCfgVariable* pVariable) {
     RecordedVariable& Original = m_Target.Variables[static_cast<std::size_t>(New.Variable)];
     Original.Versions.push_back(Found->second);
     New.Number = static_cast<unsigned>(Original.Versions.size());
-    New.Name = Original.Name + "." + std::to_string(New.Number);
+    New.Name = m_Names[static_cast<std::size_t>(New.Variable)] + "." + std::to_string(New.Number);
     return Found->second;
 }
 
@@ -178,7 +208,7 @@ void StateReader::appendName(ZfCCfgVariable* pVariable, std::string& Out) {
     if (Version >= 0)
         Out += m_Target.Versions[static_cast<std::size_t>(Version)].Name;
     else
-        Out += m_Target.Variables[static_cast<std::size_t>(variableOf(pVariable))].Name;
+        Out += m_Names[static_cast<std::size_t>(variableOf(pVariable))];
 }
 
 // What the client made itself, without a text of the program, stands at the very start of the first
@@ -384,13 +414,14 @@ void StateReader::describe(ZfCCfgStatement* pStatement, leda::node v, RecordedSt
     if (pStatement->isProcedureCall() != nullptr)
         return describeCall(pStatement, State);
     if (ZfCCfgParamStatement* pParameter = pStatement->isParamStatement())
-        return describeParameter(pParameter, State);
+        return describeParameter(pParameter, v, State);
     if (ZfCPhiFunction* pPhi = pStatement->isPhiFunction())
-        return describeJoin(pPhi, State);
+        return describeJoin(pPhi, v, State);
     if (ZfCCfgValueReturnStatement* pReturn = pStatement->isValueReturnStatement()) {
         State.Form = RecordedForm::ValueReturn;
         appendName(pReturn->getVariable(), State.Text);
         State.Text += " = " + textOf(pReturn->getExpression()) + " after the call";
+        State.Place = placeOfCallAbove(v);
         addReads(pReturn->getExpression(), {}, State);
         return;
     }
@@ -461,8 +492,10 @@ void StateReader::describeExtern(ZfCCfgExternCall* pCall, RecordedStatement& Sta
         addRead(pVariable, State.Place, State);
 }
 
-void StateReader::describeParameter(ZfCCfgParamStatement* pStatement, RecordedStatement& State) {
+void StateReader::describeParameter(ZfCCfgParamStatement* pStatement, leda::node v,
+                                    RecordedStatement& State) {
     State.Form = RecordedForm::Parameter;
+    State.Place = placeOfProcedure(v);
     appendName(pStatement->getVariable(), State.Text);
     State.Text += " = parameter";
     const char* Separator = ": ";
@@ -474,8 +507,9 @@ void StateReader::describeParameter(ZfCCfgParamStatement* pStatement, RecordedSt
     }
 }
 
-void StateReader::describeJoin(ZfCPhiFunction* pPhi, RecordedStatement& State) {
+void StateReader::describeJoin(ZfCPhiFunction* pPhi, leda::node v, RecordedStatement& State) {
     State.Form = RecordedForm::Join;
+    State.Place = placeBelow(v);
     appendName(pPhi->getVariable(), State.Text);
     State.Text += " = join(";
     const char* Separator = "";
@@ -540,6 +574,48 @@ RecordedPlace StateReader::placeOfBranchAbove(leda::node v) const {
             return placeOf(pBlock->getBranchCond());
     }
     return {};
+}
+
+// What a call leaves stands behind it, in the same block or in nodes of its own.
+RecordedPlace StateReader::placeOfCallAbove(leda::node v) const {
+    for (unsigned Steps = 0; Steps < FarthestPlace && v != nullptr; ++Steps) {
+        ZfCBasicBlock* pBlock = m_Graph.inf(v)->isBasicBlock();
+        if (pBlock == nullptr)
+            return {};
+        for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq())
+            if (pStatement->isProcedureCall() != nullptr)
+                return placeOfCall(pStatement);
+        v = onlyNeighbour(m_Graph, v, true);
+    }
+    return {};
+}
+
+// Ways meet in front of the first statement that follows.
+RecordedPlace StateReader::placeBelow(leda::node v) const {
+    for (unsigned Steps = 0; Steps < FarthestPlace && v != nullptr; ++Steps) {
+        ZfCBasicBlock* pBlock = m_Graph.inf(v)->isBasicBlock();
+        if (pBlock == nullptr)
+            return {};
+        for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq()) {
+            ZfCCfgSFAssignment* pOwn = pStatement->isSFAssignment();
+            const RecordedPlace Place =
+                pOwn != nullptr ? placeOf(pOwn->getPosition()) : placeOfCall(pStatement);
+            if (Place.isKnown())
+                return Place;
+        }
+        if (pBlock->getBranchCond() != nullptr)
+            return placeOf(pBlock->getBranchCond());
+        v = onlyNeighbour(m_Graph, v, false);
+    }
+    return {};
+}
+
+RecordedPlace StateReader::placeOfProcedure(leda::node v) const {
+    const int Owner = m_Owner[static_cast<std::size_t>(m_Graph.index(v))];
+    ZfCCfgProcedure* pProcedure =
+        m_Graph.inf(m_Entries[static_cast<std::size_t>(Owner)])->getProcedure();
+    const Procedure* pSource = m_Program.findProcedure(pProcedure->getName().cstring());
+    return pSource != nullptr ? placeOf(pSource->Position) : RecordedPlace{};
 }
 
 } // namespace hpn

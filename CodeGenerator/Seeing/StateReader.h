@@ -49,6 +49,7 @@ public:
 private:
     // Version tables
     void describeVariable(ZfCCfgSFVariable* pVariable, bool IsHidden);
+    void chooseNames();
     std::string findUnit(const Type& Of) const;
     void noteVersions();
 
@@ -68,17 +69,22 @@ private:
     void describeAssignment(ZfCCfgStatement* pStatement, leda::node v, RecordedStatement& State);
     void describeCall(ZfCCfgStatement* pStatement, RecordedStatement& State);
     void describeExtern(ZfCCfgExternCall* pCall, RecordedStatement& State);
-    void describeParameter(ZfCCfgParamStatement* pStatement, RecordedStatement& State);
-    void describeJoin(ZfCPhiFunction* pPhi, RecordedStatement& State);
+    void describeParameter(ZfCCfgParamStatement* pStatement, leda::node v,
+                           RecordedStatement& State);
+    void describeJoin(ZfCPhiFunction* pPhi, leda::node v, RecordedStatement& State);
     void addReads(ZfCCfgExpression* pExpression, RecordedPlace Otherwise, RecordedStatement& State);
     void addReads(const Term* pTerm, RecordedStatement& State);
     void addRead(ZfCCfgVariable* pVariable, RecordedPlace Place, RecordedStatement& State);
     RecordedPlace placeOfBranchAbove(leda::node v) const;
+    RecordedPlace placeOfCallAbove(leda::node v) const;
+    RecordedPlace placeBelow(leda::node v) const;
+    RecordedPlace placeOfProcedure(leda::node v) const;
 
     Recording& m_Target;
     const SourceFiles& m_Sources;
     ProgramGraph& m_Program;
     ZfCControlFlowGraph& m_Graph;
+    std::vector<std::string> m_Names;                             // by variable, as texts show it
     std::unordered_map<unsigned, int> m_VersionOf;                // by index of the version
     std::unordered_map<unsigned, int> m_StatementOf;              // latest state by id
     std::unordered_map<unsigned, int> m_NodeOf;                   // likewise
