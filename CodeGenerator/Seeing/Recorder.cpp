@@ -2,7 +2,9 @@
 
 #include "Emitter/CEmitter.h"
 #include "Seeing/Explainer.h"
+#include "Seeing/Fates.h"
 #include "Seeing/Layout.h"
+#include "Seeing/Remarks.h"
 
 namespace hpn {
 
@@ -31,6 +33,10 @@ void Recorder::afterPass(const PassStep& Step, ProgramGraph& Graph) {
                          Id == PassId::HoistCodeOutOfIfElseBranches);
     if (Id <= PassId::PropagateSparseConditionalConstant)
         noteDefinitions();
+    if (Id == PassId::InlineProcedures)
+        remarkOnCalls(m_Recording, Graph, *m_pReader);
+    if (Id == PassId::HoistCodeOutOfIfElseBranches)
+        remarkOnArms(m_Recording, Graph, *m_pReader);
     if (Id == PassId::PropagateSparseConditionalConstant)
         explainPropagation(m_Recording, Graph, *m_pReader);
 }
@@ -41,6 +47,8 @@ void Recorder::afterAll(ProgramGraph& Graph) {
 
 Recording& Recorder::finish() {
     m_pReader.reset();
+    tellFates(m_Recording);
+    collectRemarks(m_Recording);
     return m_Recording;
 }
 

@@ -1,4 +1,5 @@
 #include "Seeing/Recording.h"
+#include "Seeing/Remarks.h"
 
 #include <nlohmann/json.hpp>
 
@@ -211,6 +212,19 @@ const char* nameOf(RecordedSaturation::Answer Answer) {
 const char* nameOf(RecordedRemark::Kind Kind) {
     static const char* const Names[] = {"passed", "missed", "analysis"};
     return Names[static_cast<std::size_t>(Kind)];
+}
+
+std::string remarksToJson(const Recording& Of) {
+    Json List = Json::array();
+    for (const RecordedRemark& Each : Of.Remarks)
+        List.push_back({{"file", Of.Sources[Each.Place.File].Name},
+                        {"line", Each.Place.Line},
+                        {"column", Each.Place.Column},
+                        {"kind", nameOf(Each.What)},
+                        {"pass", Each.Pass},
+                        {"name", Each.Name},
+                        {"text", Each.Text}});
+    return List.dump(1, ' ', false, Json::error_handler_t::replace) + "\n";
 }
 
 std::string recordingToJson(const Recording& Of) {
