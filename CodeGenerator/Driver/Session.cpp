@@ -13,7 +13,9 @@
 #include "Road/PassRunner.h"
 #include "Road/RangeTable.h"
 #include "Road/Statistics.h"
+#include "Seeing/Answers.h"
 #include "Seeing/Recorder.h"
+#include "Seeing/Remarks.h"
 
 #include <cstdio>
 #include <filesystem>
@@ -122,7 +124,7 @@ struct Watchers {
             Runner.addObserver(Counts);
         if (Wanted.IsRangesWanted)
             Runner.addObserver(Ranges);
-        if (!Wanted.RecordFile.empty())
+        if (Wanted.isRecordingWanted())
             Runner.addObserver(Record);
         Runner.addObserver(Dump);
         Runner.addObserver(Times);
@@ -142,6 +144,28 @@ struct Watchers {
         if (Wanted.IsTimeWanted)
             Text += Times.print();
         return Text;
+    }
+
+    // What is answered from the recording. False: a question names nothing, and `Text` says so.
+    bool answer(const Options& Wanted, std::string& Text) {
+        if (!Wanted.isRecordingWanted())
+            return true;
+        const Recording& Whole = Record.finish();
+        if (Wanted.IsChangesWanted)
+            Text += printChanges(Whole);
+        if (Wanted.Remarks == StatisticsForm::Json)
+            Text += remarksToJson(Whole);
+        else if (Wanted.Remarks == StatisticsForm::Text)
+            std::fputs(hpn::printRemarks(Whole).c_str(), stderr);
+        for (const std::string& Question : Wanted.Questions) {
+            std::string Reply;
+            if (!explain(Whole, Question, Reply)) {
+                Text = "--explain: " + Reply;
+                return false;
+            }
+            Text += Reply;
+        }
+        return true;
     }
 
     StatisticsObserver Counts;
@@ -184,10 +208,15 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
     const EmittedProgram Code = emitProgram(Graph);
     if (Errors.hasAny())
         return ExitInternalError;
+    std::string Answers;
+    if (!Watching.answer(Wanted, Answers)) {
+        reportWrongUse(Answers);
+        return ExitWrongUse;
+    }
     FurtherFiles Further;
     if (!Wanted.RecordFile.empty())
-        Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.finish()));
-    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source), Further);
+        Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.getRecording()));
+    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source) + Answers, Further);
 }
 
 } // namespace
