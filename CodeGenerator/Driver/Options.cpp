@@ -51,6 +51,7 @@ struct Words {
     bool IsExtractionWanted = false;
     std::string Passes;
     std::string Statistics;
+    std::string Remarks;
 };
 
 void declareOptions(CLI::App& App, Options& Result, Words& Given) {
@@ -72,6 +73,19 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
     App.add_option("--dump-html", Result.HtmlDirectory,
                    "Write the table of variables after each pass")
         ->type_name("DIR");
+    App.add_option("--explain", Result.Questions,
+                   "Tell why a variable is constant or not, and what became of its "
+                   "definitions; line:17 tells it of a line")
+        ->type_name("NAME")
+        ->allow_extra_args(false);
+    App.add_flag("--remarks{text}", Given.Remarks,
+                 "Tell what was replaced, removed, inlined and moved, and what was not and why; "
+                 "--remarks=json for tools");
+    App.add_flag("--print-changed", Result.IsChangesWanted,
+                 "Print pass by pass the text of what changed, and nothing else");
+    App.add_option("--record", Result.RecordFile,
+                   "Write everything about the run as JSON, for tools")
+        ->type_name("FILE");
     App.add_flag("--stats{text}", Given.Statistics,
                  "Print what each pass did; --stats=json for tools");
     App.add_flag("--time-passes", Result.IsTimeWanted, "Print how long each pass took");
@@ -81,6 +95,17 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
                  "Turn the optimiser's own checks on (slow; for developers)");
     App.add_flag("--print", Result.IsPrintWanted,
                  "Print the program in its canonical form and do nothing else");
+}
+
+bool readForm(const CLI::App& App, const char* Option, const std::string& Word,
+              StatisticsForm& Result, std::string& Message) {
+    if (App.count(Option) == 0)
+        return true;
+    Result = Word == "json" ? StatisticsForm::Json : StatisticsForm::Text;
+    if (Word == "json" || Word == "text")
+        return true;
+    Message = std::string(Option) + ": '" + Word + "' is neither 'text' nor 'json'";
+    return false;
 }
 
 // What is wrong with the words taken together, or nothing.
@@ -94,12 +119,9 @@ std::string checkOptions(const CLI::App& App, const Words& Given, Options& Resul
     }
     if (Given.IsExtractionWanted)
         Result.Passes.extractLabelsFirst();
-    if (Given.Statistics == "json")
-        Result.Statistics = StatisticsForm::Json;
-    else if (Given.Statistics == "text")
-        Result.Statistics = StatisticsForm::Text;
-    else if (App.count("--stats") != 0)
-        return "--stats: '" + Given.Statistics + "' is neither 'text' nor 'json'";
+    if (!readForm(App, "--stats", Given.Statistics, Result.Statistics, Message) ||
+        !readForm(App, "--remarks", Given.Remarks, Result.Remarks, Message))
+        return Message;
     if (Result.IsRangesWanted &&
         !Result.Passes.contains(PassId::PropagateSparseConditionalConstant))
         return "--ranges: without propagateSparseConditionalConstant nothing is known of any "

@@ -20,12 +20,21 @@ struct Options {
     PassSequence Passes;
     std::string DotDirectory; ///< empty: no dump
     std::string HtmlDirectory;
+    std::vector<std::string> Questions; ///< of --explain
+    StatisticsForm Remarks = StatisticsForm::None;
+    bool IsChangesWanted = false;
+    std::string RecordFile; ///< the recording as JSON; empty: none
     StatisticsForm Statistics = StatisticsForm::None;
     bool IsTimeWanted = false;
     bool IsCheckWanted = false;
     bool IsRangesWanted = false;
     bool IsPrintWanted = false;
 
+    /// Something is asked for that is answered from a recording.
+    bool isRecordingWanted() const {
+        return !RecordFile.empty() || !Questions.empty() || IsChangesWanted ||
+               Remarks != StatisticsForm::None;
+    }
     bool isOutputToFile() const { return !OutputFile.empty() && OutputFile != "-"; }
 };
 

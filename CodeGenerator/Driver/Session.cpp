@@ -13,6 +13,9 @@
 #include "Road/PassRunner.h"
 #include "Road/RangeTable.h"
 #include "Road/Statistics.h"
+#include "Seeing/Answers.h"
+#include "Seeing/Recorder.h"
+#include "Seeing/Remarks.h"
 
 #include <cstdio>
 #include <filesystem>
@@ -56,14 +59,21 @@ std::string insertRuntime(const std::string& Source) {
     return Text.replace(Place, Include.size(), RuntimeHeaderText);
 }
 
-bool writeFiles(const Options& Wanted, const std::string& Source, bool NeedsRuntime) {
+// Complete files beside the C: path and text.
+using FurtherFiles = std::vector<std::pair<std::string, std::string>>;
+
+bool writeFiles(const Options& Wanted, const std::string& Source, bool NeedsRuntime,
+                const FurtherFiles& Further) {
     const std::string Runtime = RuntimeHeaderText;
     OutputFiles Files;
-    Files.add(Wanted.OutputFile, Source);
+    for (const auto& [Path, Text] : Further)
+        Files.add(Path, Text);
     const std::string Header =
         (std::filesystem::path(Wanted.OutputFile).parent_path() / RuntimeHeaderName).string();
+    if (Wanted.isOutputToFile())
+        Files.add(Wanted.OutputFile, Source);
     // A header that is there already keeps its time, so that nothing is built again for it.
-    if (NeedsRuntime && !holdsText(Header, Runtime))
+    if (Wanted.isOutputToFile() && NeedsRuntime && !holdsText(Header, Runtime))
         Files.add(Header, Runtime);
     std::string Why;
     if (Files.write(Why))
@@ -82,7 +92,7 @@ ExitStatus writeToStandardOutput(const std::string& Text) {
 ExitStatus writeText(const Options& Wanted, const std::string& Text) {
     if (!Wanted.isOutputToFile())
         return writeToStandardOutput(Text);
-    return writeFiles(Wanted, Text, false) ? ExitDone : ExitWrongUse;
+    return writeFiles(Wanted, Text, false, {}) ? ExitDone : ExitWrongUse;
 }
 
 // What the expressions found strange while the passes ran.
@@ -107,12 +117,15 @@ void printRemarks(const SourceFiles& Sources, const std::vector<Remark>& Remarks
 
 // The observers of one run, as far as they are wanted.
 struct Watchers {
-    Watchers(const Options& Wanted, PassRunner& Runner, InternalErrors& Errors)
-        : Dump(Wanted.DotDirectory, Wanted.HtmlDirectory) {
+    Watchers(const Options& Wanted, const SourceFiles& Sources, PassRunner& Runner,
+             InternalErrors& Errors)
+        : Record(Sources), Dump(Wanted.DotDirectory, Wanted.HtmlDirectory) {
         if (Wanted.Statistics != StatisticsForm::None)
             Runner.addObserver(Counts);
         if (Wanted.IsRangesWanted)
             Runner.addObserver(Ranges);
+        if (Wanted.isRecordingWanted())
+            Runner.addObserver(Record);
         Runner.addObserver(Dump);
         Runner.addObserver(Times);
         Runner.addObserver(Errors);
@@ -133,30 +146,54 @@ struct Watchers {
         return Text;
     }
 
+    // What is answered from the recording. False: a question names nothing, and `Text` says so.
+    bool answer(const Options& Wanted, std::string& Text) {
+        if (!Wanted.isRecordingWanted())
+            return true;
+        const Recording& Whole = Record.finish();
+        if (Wanted.IsChangesWanted)
+            Text += printChanges(Whole);
+        if (Wanted.Remarks == StatisticsForm::Json)
+            Text += remarksToJson(Whole);
+        else if (Wanted.Remarks == StatisticsForm::Text)
+            std::fputs(hpn::printRemarks(Whole).c_str(), stderr);
+        for (const std::string& Question : Wanted.Questions) {
+            std::string Reply;
+            if (!explain(Whole, Question, Reply)) {
+                Text = "--explain: " + Reply;
+                return false;
+            }
+            Text += Reply;
+        }
+        return true;
+    }
+
     StatisticsObserver Counts;
     RangeObserver Ranges;
+    Recorder Record;
     DumpObserver Dump;
     TimeObserver Times;
     ProgressObserver Progress;
 };
 
 ExitStatus writeResults(const Options& Wanted, const EmittedProgram& Code,
-                        const std::string& Report) {
+                        const std::string& Report, const FurtherFiles& Further) {
+    // The texts first: what fails then, fails before a file has been touched.
     if (!Wanted.isOutputToFile()) {
         std::fputs(Report.c_str(), stderr);
-        return writeToStandardOutput(insertRuntime(Code.Source));
-    }
-    // The report first: what fails then, fails before a file has been touched.
-    if (writeToStandardOutput(Report) != ExitDone)
+        if (writeToStandardOutput(insertRuntime(Code.Source)) != ExitDone)
+            return ExitWrongUse;
+    } else if (writeToStandardOutput(Report) != ExitDone) {
         return ExitWrongUse;
-    return writeFiles(Wanted, Code.Source, Code.NeedsRuntime) ? ExitDone : ExitWrongUse;
+    }
+    return writeFiles(Wanted, Code.Source, Code.NeedsRuntime, Further) ? ExitDone : ExitWrongUse;
 }
 
 ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Program& Source) {
     InternalErrors Errors(Wanted.IsCheckWanted);
     ProgramGraph Graph(Source);
     PassRunner Runner(Graph);
-    Watchers Watching(Wanted, Runner, Errors);
+    Watchers Watching(Wanted, Sources, Runner, Errors);
     if (!makeDirectory(Wanted.DotDirectory) || !makeDirectory(Wanted.HtmlDirectory))
         return ExitWrongUse;
     const bool IsRun = Runner.run(Wanted.Passes);
@@ -171,7 +208,15 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
     const EmittedProgram Code = emitProgram(Graph);
     if (Errors.hasAny())
         return ExitInternalError;
-    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source));
+    std::string Answers;
+    if (!Watching.answer(Wanted, Answers)) {
+        reportWrongUse(Answers);
+        return ExitWrongUse;
+    }
+    FurtherFiles Further;
+    if (!Wanted.RecordFile.empty())
+        Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.getRecording()));
+    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source) + Answers, Further);
 }
 
 } // namespace

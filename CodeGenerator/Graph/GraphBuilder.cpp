@@ -316,7 +316,7 @@ void GraphBuilder::callExtern(const Statement& Source, ZfCBasicBlock* pBlock) {
     for (const Variable* pRead : Source.pExtern->Reads)
         pCall->appendUsedVariable(variableOf(*pRead));
     pBlock->append(pCall);
-    m_Target.m_Externs.emplace(pCall, Source.pExtern);
+    m_Target.m_Externs.emplace(pCall, ProgramGraph::ExternUse{Source.pExtern, Source.Position});
 }
 
 // Terms

@@ -47,7 +47,12 @@ ZfCCfgSFVariable* ProgramGraph::getVariable(const Variable& Declaration) const {
 
 const Extern* ProgramGraph::getExtern(const ZfCCfgExternCall* pCall) const {
     const auto Found = m_Externs.find(pCall);
-    return Found != m_Externs.end() ? Found->second : nullptr;
+    return Found != m_Externs.end() ? Found->second.pExtern : nullptr;
+}
+
+SourcePosition ProgramGraph::getExternPosition(const ZfCCfgExternCall* pCall) const {
+    const auto Found = m_Externs.find(pCall);
+    return Found != m_Externs.end() ? Found->second.Position : SourcePosition{};
 }
 
 bool ProgramGraph::isNeverLeft(const ZfCCfgExpression* pCondition) const {

@@ -56,6 +56,8 @@ public:
     const std::deque<Variable>& getHiddenVariables() const { return m_Hidden.getAll(); }
     /// The declaration behind an extern call statement.
     const Extern* getExtern(const ZfCCfgExternCall* pCall) const;
+    /// Where an extern call statement stands in the program text.
+    SourcePosition getExternPosition(const ZfCCfgExternCall* pCall) const;
     /// A branch condition that was only put in as a way out that is never taken: the true edge is
     /// always followed. Not emitted.
     bool isNeverLeft(const ZfCCfgExpression* pCondition) const;
@@ -104,7 +106,11 @@ private:
         m_Variables; // by Variable::Index, hidden ones behind the others
     std::unordered_map<std::string_view, const Procedure*> m_Procedures;
     TermArena m_Terms;
-    std::unordered_map<const ZfCCfgExternCall*, const Extern*> m_Externs;
+    struct ExternUse {
+        const Extern* pExtern;
+        SourcePosition Position;
+    };
+    std::unordered_map<const ZfCCfgExternCall*, ExternUse> m_Externs;
     std::unordered_set<const ZfCCfgExpression*> m_NeverLeft;
     std::vector<LabelPlace> m_Labels;
     std::vector<bool> m_OutsideReachable;                     // by Procedure::Index
