@@ -1,5 +1,7 @@
 #include "Driver/Options.h"
 
+#include "Driver/Manual.h"
+
 #include <CLI/CLI.hpp>
 
 #include <algorithm>
@@ -108,6 +110,19 @@ bool readForm(const CLI::App& App, const char* Option, const std::string& Word,
     return false;
 }
 
+// For the installation, and so not among what --help lists: prints the manual page or the
+// completion that these very declarations make.
+void declareGenerator(CLI::App& App) {
+    const auto generate = [&App](const std::string& What) {
+        if (What != "man" && What != "bash")
+            throw CLI::ValidationError("--generate", "'" + What + "' is neither 'man' nor 'bash'");
+        const std::string Text = What == "man" ? printManualPage(App) : printBashCompletion(App);
+        std::fputs(Text.c_str(), stdout);
+        throw CLI::Success();
+    };
+    App.add_option_function<std::string>("--generate", generate)->group("");
+}
+
 // What is wrong with the words taken together, or nothing.
 std::string checkOptions(const CLI::App& App, const Words& Given, Options& Result) {
     std::string Message;
@@ -142,6 +157,7 @@ bool parseOptions(int ArgumentCount, const char* const* pArguments, Options& Res
     App.footer(describePasses());
     Words Given;
     declareOptions(App, Result, Given);
+    declareGenerator(App);
     Status = ExitWrongUse;
     try {
         App.parse(ArgumentCount, pArguments);
