@@ -7,10 +7,25 @@
 #include "LEDA/slist.h"
 #include "ZfCCfgValue.h"
 
+#include <cstdint>
+#include <limits>
+
 class ZfCCfgFactory;
 class ZfCCfgSFVariable;
+class ZfCCfgVariable;
 class ZfCCfgVisitor;
 class ZfCSSAVariable;
+
+namespace leda {
+
+// Lets sets of variables merge by number; as compare below.
+template <>
+struct order_number<ZfCCfgVariable*> {
+    static constexpr bool known = true;
+    static inline std::int64_t of(ZfCCfgVariable* const& pVariable);
+};
+
+} // namespace leda
 
 // A variable of the intermediate code.
 //
@@ -147,14 +162,15 @@ private:
 
 namespace leda {
 
+inline std::int64_t order_number<ZfCCfgVariable*>::of(ZfCCfgVariable* const& pVariable) {
+    return pVariable != nullptr ? pVariable->getDebugIndex()
+                                : std::numeric_limits<std::int64_t>::min();
+}
+
 // Order of sets of variables: null first, then by debug index.
 inline int compare(ZfCCfgVariable* const& pLeft, ZfCCfgVariable* const& pRight) {
-    if (pLeft == pRight)
-        return 0;
-    if (pLeft == nullptr || pRight == nullptr)
-        return pLeft == nullptr ? -1 : 1;
-    const int Left = pLeft->getDebugIndex();
-    const int Right = pRight->getDebugIndex();
+    const std::int64_t Left = order_number<ZfCCfgVariable*>::of(pLeft);
+    const std::int64_t Right = order_number<ZfCCfgVariable*>::of(pRight);
     return (Left > Right) - (Left < Right);
 }
 
