@@ -22,6 +22,7 @@ def parse():
                                      "and prints medians, ratios, memory, growth and the goals.")
     parser.add_argument("families", nargs="*", metavar="FAMILY", help="default: " + " ".join(FAMILIES))
     parser.add_argument("--quick", action="store_true", help="two sizes and one run of each instead of five and three")
+    parser.add_argument("--sizes", metavar="N,N,...", help="these sizes instead")
     parser.add_argument("--ours-only", action="store_true", help="leave gcc and LLVM out")
     parser.add_argument("--runs", type=int, help="runs of each tool on each program")
     parser.add_argument("--update-documentation", action="store_true", help="write the result into Documentation/Performance.md and .svg")
@@ -34,12 +35,17 @@ def parse():
     for family in wanted.families:
         if family not in FAMILIES:
             parser.error(f"no family '{family}'; there are {', '.join(FAMILIES)}")
+    if wanted.sizes and not re.fullmatch(r"\d+(,\d+)*", wanted.sizes):
+        parser.error("--sizes takes numbers with commas between them")
+    wanted.counts = QUICK_SIZES if wanted.quick else SIZES
+    if wanted.sizes:
+        wanted.counts = sorted(int(size) for size in wanted.sizes.split(","))
     return wanted
 
 
 def measure_family(bench, figures, wanted, family, tools):
     gone = set()  # a tool that failed on one size is not asked for the next one
-    for count in QUICK_SIZES if wanted.quick else SIZES:
+    for count in wanted.counts:
         # Large programs say enough in fewer runs.
         runs = wanted.runs or (1 if wanted.quick else 3)
         for number in range(runs if count < 300000 else min(runs, 2)):
