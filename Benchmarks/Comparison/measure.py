@@ -103,7 +103,9 @@ class Bench:
     def gcc_times(self, family, count):
         text, _, peak = run([self.gcc, *GCC_FLAGS, "-c", self.c_program(family, count), "-o", self.path(family, count, "o")],
                             self.limit)
-        seconds = 0.0
+        if not re.search(r"^ TOTAL +:", text, re.M):
+            raise Failed("gcc gave no report of its times")
+        seconds = 0.0  # what took less than a hundredth of a second has no line
         for name in GCC_PASSES:
             found = re.search(rf"^ {re.escape(name)} +: +([\d.]+) \( *\d+%\) +([\d.]+)", text, re.M)
             seconds += float(found.group(1)) + float(found.group(2)) if found else 0.0
@@ -127,7 +129,7 @@ def pass_seconds(report, name):
     names = re.findall(r"-+ ?([A-Za-z+ ]+?) ?-+(?= |$)", columns.group(1)) if columns else []
     row = re.search(rf"^(.*\)) +{name}$", report, re.M)
     if not row:
-        return 0.0
+        raise Failed(f"opt's report has no line for {name}")
     values = [float(value) for value in re.findall(r"([\d.]+) \( *[\d.]+%\)", row.group(1))]
     wanted = [value for column, value in zip(names, values) if column in ("User Time", "System Time")]
     return sum(wanted) if wanted else values[0]
