@@ -189,9 +189,10 @@ ExitStatus writeResults(const Options& Wanted, const EmittedProgram& Code,
     return writeFiles(Wanted, Code.Source, Code.NeedsRuntime, Further) ? ExitDone : ExitWrongUse;
 }
 
-ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Program& Source) {
+ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& Source) {
     InternalErrors Errors(Wanted.IsCheckWanted);
     ProgramGraph Graph(Source);
+    Source.dropBodies();
     PassRunner Runner(Graph);
     Watchers Watching(Wanted, Sources, Runner, Errors);
     if (!makeDirectory(Wanted.DotDirectory) || !makeDirectory(Wanted.HtmlDirectory))
