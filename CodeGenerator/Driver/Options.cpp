@@ -54,6 +54,8 @@ struct Words {
     std::string Passes;
     std::string Statistics;
     std::string Remarks;
+    std::vector<std::string> Settings;
+    std::vector<std::string> Ranges;
 };
 
 void declareOptions(CLI::App& App, Options& Result, Words& Given) {
@@ -85,6 +87,14 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
                  "--remarks=json for tools");
     App.add_flag("--print-changed", Result.IsChangesWanted,
                  "Print pass by pass the text of what changed, and nothing else");
+    App.add_option("--set", Given.Settings, "For this run a param has another value")
+        ->type_name("NAME=VALUE")
+        ->allow_extra_args(false);
+    App.add_option("--range", Given.Ranges,
+                   "For this run believe that an input stays in a range; --stats shows what "
+                   "--set and --range change")
+        ->type_name("INPUT=LO..HI")
+        ->allow_extra_args(false);
     App.add_option("--record", Result.RecordFile,
                    "Write everything about the run as JSON, for tools")
         ->type_name("FILE");
@@ -137,6 +147,12 @@ std::string checkOptions(const CLI::App& App, const Words& Given, Options& Resul
     if (!readForm(App, "--stats", Given.Statistics, Result.Statistics, Message) ||
         !readForm(App, "--remarks", Given.Remarks, Result.Remarks, Message))
         return Message;
+    for (const std::string& Each : Given.Settings)
+        if (!Result.Assumed.addSetting(Each, Message))
+            return "--set: " + Message;
+    for (const std::string& Each : Given.Ranges)
+        if (!Result.Assumed.addRange(Each, Message))
+            return "--range: " + Message;
     if (Result.IsRangesWanted &&
         !Result.Passes.contains(PassId::PropagateSparseConditionalConstant))
         return "--ranges: without propagateSparseConditionalConstant nothing is known of any "

@@ -1,6 +1,7 @@
 #ifndef OPTIONS_H
 #define OPTIONS_H
 
+#include "Driver/Assumptions.h"
 #include "Road/PassSequence.h"
 
 #include <string>
@@ -23,6 +24,7 @@ struct Options {
     std::vector<std::string> Questions; ///< of --explain
     StatisticsForm Remarks = StatisticsForm::None;
     bool IsChangesWanted = false;
+    Assumptions Assumed;    ///< --set and --range
     std::string RecordFile; ///< the recording as JSON; empty: none
     StatisticsForm Statistics = StatisticsForm::None;
     bool IsTimeWanted = false;

@@ -132,13 +132,17 @@ struct Watchers {
         Runner.addObserver(Progress);
     }
 
-    std::string report(const Options& Wanted, const SourceFiles& Sources,
-                       const Program& Source) const {
+    std::string report(const Options& Wanted, const SourceFiles& Sources, const Program& Source,
+                       const Statistics* pWithout) const {
         std::string Text;
-        if (Wanted.Statistics == StatisticsForm::Text)
+        const std::vector<std::string> Assumed = Wanted.Assumed.describe();
+        if (Wanted.Statistics == StatisticsForm::Text) {
             Text += printStatistics(Counts.getStatistics());
+            if (pWithout != nullptr)
+                Text += printComparison(*pWithout, Counts.getStatistics(), Assumed);
+        }
         if (Wanted.Statistics == StatisticsForm::Json)
-            Text += printStatisticsAsJson(Counts.getStatistics(), Source.Name);
+            Text += printStatisticsAsJson(Counts.getStatistics(), Source.Name, Assumed, pWithout);
         if (Wanted.IsRangesWanted)
             Text += printRanges(Ranges.getRows(), Sources);
         if (Wanted.IsTimeWanted)
@@ -189,7 +193,16 @@ ExitStatus writeResults(const Options& Wanted, const EmittedProgram& Code,
     return writeFiles(Wanted, Code.Source, Code.NeedsRuntime, Further) ? ExitDone : ExitWrongUse;
 }
 
-ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Program& Source) {
+// What holds for this run alone, at the head of the C: whoever finds the file later must know.
+std::string describeAssumptions(const std::vector<std::string>& Sentences) {
+    std::string Text;
+    for (const std::string& Each : Sentences)
+        Text += "/* For this run alone: " + Each + ". */\n";
+    return Text;
+}
+
+ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Program& Source,
+                    const Statistics* pWithout) {
     InternalErrors Errors(Wanted.IsCheckWanted);
     ProgramGraph Graph(Source);
     PassRunner Runner(Graph);
@@ -205,7 +218,10 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
     }
     if (!IsRun)
         return ExitInternalError;
-    const EmittedProgram Code = emitProgram(Graph);
+    EmittedProgram Code = emitProgram(Graph);
+    const std::vector<std::string> Assumed = Wanted.Assumed.describe();
+    Code.Source.insert(0, describeAssumptions(Assumed));
+    Watching.Record.getRecording().Assumptions = Assumed;
     if (Errors.hasAny())
         return ExitInternalError;
     std::string Answers;
@@ -216,7 +232,26 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
     FurtherFiles Further;
     if (!Wanted.RecordFile.empty())
         Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.getRecording()));
-    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source) + Answers, Further);
+    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source, pWithout) + Answers,
+                        Further);
+}
+
+// The statistics of the run without its assumptions. False: something inside is broken.
+bool runWithout(const Options& Wanted, const SourceFiles& Sources, Statistics& Without) {
+    Diagnostics Messages(Sources); // said again by the run proper
+    Program Source;
+    if (!readProgram(Sources, Messages, Source))
+        return true;
+    InternalErrors Errors(Wanted.IsCheckWanted);
+    ProgramGraph Graph(Source);
+    PassRunner Runner(Graph);
+    StatisticsObserver Counts;
+    Runner.addObserver(Counts);
+    Runner.addObserver(Errors);
+    const bool IsRun = Runner.run(Wanted.Passes);
+    pendingWarnings().clear();
+    Without = Counts.getStatistics();
+    return IsRun;
 }
 
 } // namespace
@@ -227,13 +262,23 @@ ExitStatus runSession(const Options& Wanted) {
         return ExitWrongUse;
     Diagnostics Messages(Sources);
     Program Source;
+    Wanted.Assumed.prepare(Source);
     const bool IsRead = readProgram(Sources, Messages, Source);
     std::fputs(Messages.print().c_str(), stderr);
     if (!IsRead)
         return ExitProgramMistakes;
+    std::string Why;
+    if (!Wanted.Assumed.apply(Source, Why)) {
+        reportWrongUse(Why);
+        return ExitWrongUse;
+    }
     if (Wanted.IsPrintWanted)
         return writeText(Wanted, printProgram(Source));
-    return optimise(Wanted, Sources, Source);
+    const bool IsCompared = !Wanted.Assumed.isEmpty() && Wanted.Statistics != StatisticsForm::None;
+    Statistics Without;
+    if (IsCompared && !runWithout(Wanted, Sources, Without))
+        return ExitInternalError;
+    return optimise(Wanted, Sources, Source, IsCompared ? &Without : nullptr);
 }
 
 } // namespace hpn

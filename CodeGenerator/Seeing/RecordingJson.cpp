@@ -157,10 +157,9 @@ static Json toJson(const RecordedSaturation& Saturation) {
 }
 
 static Json toJson(const RecordedFate& Fate) {
-    return {{"statement", Fate.Statement},
-            {"isRemoved", Fate.IsRemoved},
-            {"snapshot", Fate.Snapshot},
-            {"why", Fate.Why},
+    return {{"statement", Fate.Statement},     {"isRemoved", Fate.IsRemoved},
+            {"snapshot", Fate.Snapshot},       {"goesOn", Fate.GoesOn},
+            {"looksUnused", Fate.LooksUnused}, {"why", Fate.Why},
             {"because", toJson(Fate.Because)}};
 }
 
