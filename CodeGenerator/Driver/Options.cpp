@@ -95,6 +95,9 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
                    "--set and --range change")
         ->type_name("INPUT=LO..HI")
         ->allow_extra_args(false);
+    App.add_option("--rewrite-limit", Result.RewriteLimit,
+                   "Let the first N single changes happen and no more (see Scripts/bisect)")
+        ->type_name("N");
     App.add_option("--record", Result.RecordFile,
                    "Write everything about the run as JSON, for tools")
         ->type_name("FILE");

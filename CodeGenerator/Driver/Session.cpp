@@ -12,6 +12,7 @@
 #include "Road/GraphDump.h"
 #include "Road/PassRunner.h"
 #include "Road/RangeTable.h"
+#include "Road/RewriteLimiter.h"
 #include "Road/Statistics.h"
 #include "Seeing/Answers.h"
 #include "Seeing/Recorder.h"
@@ -19,6 +20,7 @@
 
 #include <cstdio>
 #include <filesystem>
+#include <memory>
 #include <string_view>
 
 namespace hpn {
@@ -120,6 +122,10 @@ struct Watchers {
     Watchers(const Options& Wanted, const SourceFiles& Sources, PassRunner& Runner,
              InternalErrors& Errors)
         : Record(Sources), Dump(Wanted.DotDirectory, Wanted.HtmlDirectory) {
+        if (Wanted.isRewriteLimited()) {
+            pLimit = std::make_unique<RewriteLimiter>(Wanted.RewriteLimit);
+            Runner.addObserver(*pLimit);
+        }
         if (Wanted.Statistics != StatisticsForm::None)
             Runner.addObserver(Counts);
         if (Wanted.IsRangesWanted)
@@ -150,6 +156,25 @@ struct Watchers {
         return Text;
     }
 
+    // How many changes were made, and the last of them.
+    std::string reportRewrites(const SourceFiles& Sources) const {
+        if (pLimit == nullptr)
+            return "";
+        const RewriteBudget& Budget = pLimit->getBudget();
+        std::string Text = "rewrites made: " + std::to_string(Budget.getCount()) + " of at most " +
+                           std::to_string(Budget.getLimit()) + "\n";
+        if (Budget.getCount() == 0)
+            return Text;
+        const SourcePosition Place = Budget.getLastPosition();
+        Text += "last rewrite: ";
+        if (Place.File != 0 || Place.Offset != 0) {
+            const LineAndColumn At = Sources.locate(Place);
+            Text += Sources.getName(Place.File) + ":" + std::to_string(At.Line) + ":" +
+                    std::to_string(At.Column) + ": ";
+        }
+        return Text + Budget.getLastText() + "\n";
+    }
+
     // What is answered from the recording. False: a question names nothing, and `Text` says so.
     bool answer(const Options& Wanted, std::string& Text) {
         if (!Wanted.isRecordingWanted())
@@ -172,6 +197,7 @@ struct Watchers {
         return true;
     }
 
+    std::unique_ptr<RewriteLimiter> pLimit; // null: no limit
     StatisticsObserver Counts;
     RangeObserver Ranges;
     Recorder Record;
@@ -218,8 +244,12 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
     }
     if (!IsRun)
         return ExitInternalError;
+    const std::string Rewrites = Watching.reportRewrites(Sources);
     EmittedProgram Code = emitProgram(Graph);
-    const std::vector<std::string> Assumed = Wanted.Assumed.describe();
+    std::vector<std::string> Assumed = Wanted.Assumed.describe();
+    if (Wanted.isRewriteLimited())
+        Assumed.push_back("at most " + std::to_string(Wanted.RewriteLimit) +
+                          " single changes happen (--rewrite-limit)");
     Code.Source.insert(0, describeAssumptions(Assumed));
     Watching.Record.getRecording().Assumptions = Assumed;
     if (Errors.hasAny())
@@ -232,7 +262,8 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Pro
     FurtherFiles Further;
     if (!Wanted.RecordFile.empty())
         Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.getRecording()));
-    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source, pWithout) + Answers,
+    return writeResults(Wanted, Code,
+                        Watching.report(Wanted, Sources, Source, pWithout) + Rewrites + Answers,
                         Further);
 }
 
