@@ -211,7 +211,7 @@ void checkRecording(const Recording& Of) {
 
 TEST(Seeing, RecordingsOfRandomProgramsHoldTogether) {
     for (std::uint32_t Seed = 1; Seed <= 60; ++Seed) {
-        const std::string Text = RandomProgram(Seed).text();
+        const std::string Text = fuzz::RandomProgram(Seed).text();
         const SeenRun Seen(Text);
         const SeenRun Unseen(Text, nullptr, false);
         ASSERT_EQ(Seen.Code, Unseen.Code) << "watching changed the code of seed " << Seed;
