@@ -199,7 +199,8 @@ void checkRecording(const Recording& Of) {
                 << Of.Statements[static_cast<std::size_t>(Each.Before)].Text;
         }
         std::map<unsigned, std::string> Standing;
-        for (const Layout::Entry& Entry : Layout(Of, Now).getEntries()) {
+        const Layout Where(Of, Now);
+        for (const Layout::Entry& Entry : Where.getEntries()) {
             const RecordedStatement& Each = Of.Statements[static_cast<std::size_t>(Entry.State)];
             Standing[Each.Id] = Each.Text;
         }
