@@ -28,6 +28,10 @@ const char* const Examples =
     "  hpncg cruise.hpn --extract-labels -o cruise.c\n"
     "                                          shared labels become procedures; remarks tell which "
     "do not\n"
+    "  hpncg cruise.hpn --explain=throttle --explain=line:17 -o cruise.c\n"
+    "                                          why it is constant or not, what became of the line\n"
+    "  hpncg cruise.hpn --set HAS_RESUME=true --range vehicle_speed=0..120 --stats -o cruise.c\n"
+    "                                          what another option and a believed input change\n"
     "  hpncg --no-optimize - < cruise.hpn      the code as written, to standard output\n"
     "  hpncg --print a.hpn b.hpn               the program in its canonical form\n"
     "\n"
@@ -54,6 +58,8 @@ struct Words {
     std::string Passes;
     std::string Statistics;
     std::string Remarks;
+    std::vector<std::string> Settings;
+    std::vector<std::string> Ranges;
 };
 
 void declareOptions(CLI::App& App, Options& Result, Words& Given) {
@@ -85,6 +91,17 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
                  "--remarks=json for tools");
     App.add_flag("--print-changed", Result.IsChangesWanted,
                  "Print pass by pass the text of what changed, and nothing else");
+    App.add_option("--set", Given.Settings, "For this run a param has another value")
+        ->type_name("NAME=VALUE")
+        ->allow_extra_args(false);
+    App.add_option("--range", Given.Ranges,
+                   "For this run believe that an input stays in a range; --stats shows what "
+                   "--set and --range change")
+        ->type_name("INPUT=LO..HI")
+        ->allow_extra_args(false);
+    App.add_option("--rewrite-limit", Result.RewriteLimit,
+                   "Let the first N single changes happen and no more (see Scripts/bisect)")
+        ->type_name("N");
     App.add_option("--record", Result.RecordFile,
                    "Write everything about the run as JSON, for tools")
         ->type_name("FILE");
@@ -137,6 +154,12 @@ std::string checkOptions(const CLI::App& App, const Words& Given, Options& Resul
     if (!readForm(App, "--stats", Given.Statistics, Result.Statistics, Message) ||
         !readForm(App, "--remarks", Given.Remarks, Result.Remarks, Message))
         return Message;
+    for (const std::string& Each : Given.Settings)
+        if (!Result.Assumed.addSetting(Each, Message))
+            return "--set: " + Message;
+    for (const std::string& Each : Given.Ranges)
+        if (!Result.Assumed.addRange(Each, Message))
+            return "--range: " + Message;
     if (Result.IsRangesWanted &&
         !Result.Passes.contains(PassId::PropagateSparseConditionalConstant))
         return "--ranges: without propagateSparseConditionalConstant nothing is known of any "

@@ -1,8 +1,10 @@
 #ifndef OPTIONS_H
 #define OPTIONS_H
 
+#include "Driver/Assumptions.h"
 #include "Road/PassSequence.h"
 
+#include <cstddef>
 #include <string>
 #include <vector>
 
@@ -23,6 +25,9 @@ struct Options {
     std::vector<std::string> Questions; ///< of --explain
     StatisticsForm Remarks = StatisticsForm::None;
     bool IsChangesWanted = false;
+    static constexpr std::size_t NoLimit = static_cast<std::size_t>(-1);
+    std::size_t RewriteLimit = NoLimit;
+    Assumptions Assumed;    ///< --set and --range
     std::string RecordFile; ///< the recording as JSON; empty: none
     StatisticsForm Statistics = StatisticsForm::None;
     bool IsTimeWanted = false;
@@ -35,6 +40,7 @@ struct Options {
         return !RecordFile.empty() || !Questions.empty() || IsChangesWanted ||
                Remarks != StatisticsForm::None;
     }
+    bool isRewriteLimited() const { return RewriteLimit != NoLimit; }
     bool isOutputToFile() const { return !OutputFile.empty() && OutputFile != "-"; }
 };
 

@@ -69,13 +69,41 @@ std::string printStatistics(const Statistics& Counts) {
     return Text;
 }
 
-std::string printStatisticsAsJson(const Statistics& Counts, const std::string& ProgramName) {
+std::string printComparison(const Statistics& Without, const Statistics& With,
+                            const std::vector<std::string>& Assumptions) {
+    std::string Text = "\nfor this run alone:\n";
+    for (const std::string& Each : Assumptions)
+        Text += "  " + Each + "\n";
+    appendLine(Text, "%-36s %10s %10s %10s", "", "without", "with", "difference");
+    const auto appendPair = [&Text](const char* Name, std::size_t Old, std::size_t New) {
+        appendLine(Text, "%-36s %10zu %10zu %+10lld", Name, Old, New,
+                   static_cast<long long>(New) - static_cast<long long>(Old));
+    };
+    appendPair("statements at the end", Without.After.Statements, With.After.Statements);
+    appendPair("conditions at the end", Without.After.Conditions, With.After.Conditions);
+    appendPair("procedures at the end", Without.After.Procedures, With.After.Procedures);
+    appendPair("nodes at the end", Without.After.Nodes, With.After.Nodes);
+    for (const Figure& Each : Figures)
+        appendPair(Each.Title, Without.*Each.pValue, With.*Each.pValue);
+    return Text;
+}
+
+std::string printStatisticsAsJson(const Statistics& Counts, const std::string& ProgramName,
+                                  const std::vector<std::string>& Assumptions,
+                                  const Statistics* pWithout) {
     nlohmann::ordered_json Root;
     Root["program"] = ProgramName;
     Root["before"] = toJson(Counts.Before);
     Root["after"] = toJson(Counts.After);
     for (const Figure& Each : Figures)
         Root[Each.Key] = Counts.*Each.pValue;
+    if (pWithout != nullptr) {
+        Root["assumptions"] = Assumptions;
+        nlohmann::ordered_json& Without = Root["without"];
+        Without["after"] = toJson(pWithout->After);
+        for (const Figure& Each : Figures)
+            Without[Each.Key] = pWithout->*Each.pValue;
+    }
     Root["passes"] = nlohmann::ordered_json::array();
     for (const Statistics::Record& Each : Counts.Passes)
         Root["passes"].push_back({{"name", Each.PassName},

@@ -11,8 +11,14 @@ namespace hpn {
 
 /// The statistics as tables to read.
 std::string printStatistics(const Statistics& Counts);
-/// The same for tools. Times are left out: two runs give the same bytes.
-std::string printStatisticsAsJson(const Statistics& Counts, const std::string& ProgramName);
+/// What the assumptions of a run changed, from the statistics of the run without them.
+std::string printComparison(const Statistics& Without, const Statistics& With,
+                            const std::vector<std::string>& Assumptions);
+/// The statistics for tools; `pWithout`, if not null, is the run without the assumptions. Times are
+/// left out: two runs give the same bytes.
+std::string printStatisticsAsJson(const Statistics& Counts, const std::string& ProgramName,
+                                  const std::vector<std::string>& Assumptions = {},
+                                  const Statistics* pWithout = nullptr);
 
 /// Gathers what each pass took.
 class TimeObserver : public PassObserver {

@@ -12,6 +12,7 @@
 #include "Road/GraphDump.h"
 #include "Road/PassRunner.h"
 #include "Road/RangeTable.h"
+#include "Road/RewriteLimiter.h"
 #include "Road/Statistics.h"
 #include "Seeing/Answers.h"
 #include "Seeing/Recorder.h"
@@ -19,6 +20,7 @@
 
 #include <cstdio>
 #include <filesystem>
+#include <memory>
 #include <string_view>
 
 namespace hpn {
@@ -120,6 +122,10 @@ struct Watchers {
     Watchers(const Options& Wanted, const SourceFiles& Sources, PassRunner& Runner,
              InternalErrors& Errors)
         : Record(Sources), Dump(Wanted.DotDirectory, Wanted.HtmlDirectory) {
+        if (Wanted.isRewriteLimited()) {
+            pLimit = std::make_unique<RewriteLimiter>(Wanted.RewriteLimit);
+            Runner.addObserver(*pLimit);
+        }
         if (Wanted.Statistics != StatisticsForm::None)
             Runner.addObserver(Counts);
         if (Wanted.IsRangesWanted)
@@ -132,18 +138,41 @@ struct Watchers {
         Runner.addObserver(Progress);
     }
 
-    std::string report(const Options& Wanted, const SourceFiles& Sources,
-                       const Program& Source) const {
+    std::string report(const Options& Wanted, const SourceFiles& Sources, const Program& Source,
+                       const Statistics* pWithout) const {
         std::string Text;
-        if (Wanted.Statistics == StatisticsForm::Text)
+        const std::vector<std::string> Assumed = Wanted.Assumed.describe();
+        if (Wanted.Statistics == StatisticsForm::Text) {
             Text += printStatistics(Counts.getStatistics());
+            if (pWithout != nullptr)
+                Text += printComparison(*pWithout, Counts.getStatistics(), Assumed);
+        }
         if (Wanted.Statistics == StatisticsForm::Json)
-            Text += printStatisticsAsJson(Counts.getStatistics(), Source.Name);
+            Text += printStatisticsAsJson(Counts.getStatistics(), Source.Name, Assumed, pWithout);
         if (Wanted.IsRangesWanted)
             Text += printRanges(Ranges.getRows(), Sources);
         if (Wanted.IsTimeWanted)
             Text += Times.print();
         return Text;
+    }
+
+    // How many changes were made, and the last of them.
+    std::string reportRewrites(const SourceFiles& Sources) const {
+        if (pLimit == nullptr)
+            return "";
+        const RewriteBudget& Budget = pLimit->getBudget();
+        std::string Text = "rewrites made: " + std::to_string(Budget.getCount()) + " of at most " +
+                           std::to_string(Budget.getLimit()) + "\n";
+        if (Budget.getCount() == 0)
+            return Text;
+        const SourcePosition Place = Budget.getLastPosition();
+        Text += "last rewrite: ";
+        if (Place.File != 0 || Place.Offset != 0) {
+            const LineAndColumn At = Sources.locate(Place);
+            Text += Sources.getName(Place.File) + ":" + std::to_string(At.Line) + ":" +
+                    std::to_string(At.Column) + ": ";
+        }
+        return Text + Budget.getLastText() + "\n";
     }
 
     // What is answered from the recording. False: a question names nothing, and `Text` says so.
@@ -168,6 +197,7 @@ struct Watchers {
         return true;
     }
 
+    std::unique_ptr<RewriteLimiter> pLimit; // null: no limit
     StatisticsObserver Counts;
     RangeObserver Ranges;
     Recorder Record;
@@ -189,7 +219,16 @@ ExitStatus writeResults(const Options& Wanted, const EmittedProgram& Code,
     return writeFiles(Wanted, Code.Source, Code.NeedsRuntime, Further) ? ExitDone : ExitWrongUse;
 }
 
-ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& Source) {
+// What holds for this run alone, at the head of the C: whoever finds the file later must know.
+std::string describeAssumptions(const std::vector<std::string>& Sentences) {
+    std::string Text;
+    for (const std::string& Each : Sentences)
+        Text += "/* For this run alone: " + Each + ". */\n";
+    return Text;
+}
+
+ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& Source,
+                    const Statistics* pWithout) {
     InternalErrors Errors(Wanted.IsCheckWanted);
     ProgramGraph Graph(Source);
     Source.dropBodies();
@@ -206,7 +245,14 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& 
     }
     if (!IsRun)
         return ExitInternalError;
-    const EmittedProgram Code = emitProgram(Graph);
+    const std::string Rewrites = Watching.reportRewrites(Sources);
+    EmittedProgram Code = emitProgram(Graph);
+    std::vector<std::string> Assumed = Wanted.Assumed.describe();
+    if (Wanted.isRewriteLimited())
+        Assumed.push_back("at most " + std::to_string(Wanted.RewriteLimit) +
+                          " single changes happen (--rewrite-limit)");
+    Code.Source.insert(0, describeAssumptions(Assumed));
+    Watching.Record.getRecording().Assumptions = Assumed;
     if (Errors.hasAny())
         return ExitInternalError;
     std::string Answers;
@@ -217,7 +263,27 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& 
     FurtherFiles Further;
     if (!Wanted.RecordFile.empty())
         Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.getRecording()));
-    return writeResults(Wanted, Code, Watching.report(Wanted, Sources, Source) + Answers, Further);
+    return writeResults(Wanted, Code,
+                        Watching.report(Wanted, Sources, Source, pWithout) + Rewrites + Answers,
+                        Further);
+}
+
+// The statistics of the run without its assumptions. False: something inside is broken.
+bool runWithout(const Options& Wanted, const SourceFiles& Sources, Statistics& Without) {
+    Diagnostics Messages(Sources); // said again by the run proper
+    Program Source;
+    if (!readProgram(Sources, Messages, Source))
+        return true;
+    InternalErrors Errors(Wanted.IsCheckWanted);
+    ProgramGraph Graph(Source);
+    PassRunner Runner(Graph);
+    StatisticsObserver Counts;
+    Runner.addObserver(Counts);
+    Runner.addObserver(Errors);
+    const bool IsRun = Runner.run(Wanted.Passes);
+    pendingWarnings().clear();
+    Without = Counts.getStatistics();
+    return IsRun;
 }
 
 } // namespace
@@ -228,13 +294,23 @@ ExitStatus runSession(const Options& Wanted) {
         return ExitWrongUse;
     Diagnostics Messages(Sources);
     Program Source;
+    Wanted.Assumed.prepare(Source);
     const bool IsRead = readProgram(Sources, Messages, Source);
     std::fputs(Messages.print().c_str(), stderr);
     if (!IsRead)
         return ExitProgramMistakes;
+    std::string Why;
+    if (!Wanted.Assumed.apply(Source, Why)) {
+        reportWrongUse(Why);
+        return ExitWrongUse;
+    }
     if (Wanted.IsPrintWanted)
         return writeText(Wanted, printProgram(Source));
-    return optimise(Wanted, Sources, Source);
+    const bool IsCompared = !Wanted.Assumed.isEmpty() && Wanted.Statistics != StatisticsForm::None;
+    Statistics Without;
+    if (IsCompared && !runWithout(Wanted, Sources, Without))
+        return ExitInternalError;
+    return optimise(Wanted, Sources, Source, IsCompared ? &Without : nullptr);
 }
 
 } // namespace hpn

@@ -1,5 +1,6 @@
 #include "Graph/LabelExtraction.h"
 
+#include "Model/RewriteBudget.h"
 #include "ZfCCfgFactory.h"
 #include "ZfCCfgProcedure.h"
 #include "ZfCCfgProcedureCall.h"
@@ -183,6 +184,8 @@ void LabelExtraction::extract(const LabelPlace& Label) {
         return;
     if (const char* pWhy = findObstacle(Label))
         return refuse(Label, pWhy);
+    if (!mayRewrite("procedure made of a label", Label.pLabel->Position))
+        return;
     // The call that the library gives back would be one more than there were jumps.
     ZfCCfgFactory::getInstance()->delStatement(m_Graph.makeProcedureAndCall(Label.Node));
 }

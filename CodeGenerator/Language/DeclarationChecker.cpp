@@ -98,6 +98,14 @@ void DeclarationChecker::computeInitial(Variable& Target) {
         Target.Initial.push_back(Stored);
     }
     Target.Initial.resize(Wanted, convertNumber(0.0, *Target.pType));
+    if (Target.Kind == VariableKind::Param && Target.Count == 0)
+        applySettings(Target);
+}
+
+void DeclarationChecker::applySettings(Variable& Target) const {
+    for (const auto& [Name, Value] : m_State.Target.Settings)
+        if (Name == Target.Name)
+            Target.Initial.front() = convertNumber(Value, *Target.pType);
 }
 
 void DeclarationChecker::completeAccess(const PendingAccess& Access) {

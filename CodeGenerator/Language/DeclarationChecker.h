@@ -25,6 +25,7 @@ private:
     bool completeCount(const PendingVariable& Pending);
     bool checkInitializer(const PendingVariable& Pending);
     void computeInitial(Variable& Target);
+    void applySettings(Variable& Target) const;
     void completeAccess(const PendingAccess& Access);
     void checkMain();
 

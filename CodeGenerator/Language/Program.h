@@ -9,6 +9,7 @@
 #include <string>
 #include <string_view>
 #include <type_traits>
+#include <utility>
 #include <vector>
 
 namespace hpn {
@@ -126,6 +127,11 @@ struct Variable {
     Procedure* pOwner = nullptr;        ///< of Local, Formal, Result
     SourcePosition Position;
     std::uint32_t Index = 0; ///< place in Program::Variables
+    /// Input: for this run the user vouches that it stays between the two, in place of all that its
+    /// storage can hold.
+    bool HasBelievedRange = false;
+    double BelievedLow = 0.0;
+    double BelievedHigh = 0.0;
 };
 
 /// Code outside the program: may read and write the listed variables whenever it is called.
@@ -237,6 +243,9 @@ struct Program {
     std::deque<Procedure> Procedures; ///< in the order of declaration
     std::deque<Extern> Externs;
     Procedure* pMain = nullptr;
+    /// For this run: params, by name, with another value than the one in the text. Filled before
+    /// the program is read, since other declarations may be computed from them.
+    std::vector<std::pair<std::string, double>> Settings;
 
     /// Takes room for a node; the node lives as long as the program.
     Expression* newExpression() { return m_Expressions.make(); }

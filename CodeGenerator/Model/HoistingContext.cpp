@@ -1,5 +1,8 @@
 #include "Model/HoistingContext.h"
 
+#include "Model/RewriteBudget.h"
+#include "Model/ZfCCfgSFAssignment.h"
+#include "Model/ZfCCfgSFProcedureCall.h"
 #include "Model/ZfCCfgSFVariable.h"
 
 // Moving a statement in front of its branch.
@@ -42,6 +45,13 @@ static bool readsWhatExternsWrite(ZfCCfgExpression* pCondition) {
     return false;
 }
 
+static SourcePosition positionOf(ZfCCfgStatement* pStatement) {
+    if (ZfCCfgSFAssignment* pAssignment = pStatement->isSFAssignment())
+        return pAssignment->getPosition();
+    ZfCCfgSFProcedureCall* pCall = pStatement->isSFProcedureCall();
+    return pCall != nullptr ? pCall->getPosition() : SourcePosition{};
+}
+
 /// The nearest branch above, along nodes with one way in; null if a join or an entry comes first.
 leda::node HoistingContext::findBranch(leda::node v) {
     while (m_Graph.indeg(v) == 1) {
@@ -81,6 +91,8 @@ bool HoistingContext::moveInFrontOfBranch(ZfCCfgStatement* pStatement) {
     if (!pBranch->getStatementSeq().empty() || !pBranch->getPhiFunctions().empty())
         return false;
     if (pStatement->isProcedureCall() != nullptr && readsWhatExternsWrite(pBranch->getBranchCond()))
+        return false;
+    if (!mayRewrite("statement moved in front of its branch", positionOf(pStatement)))
         return false;
     insertBefore(Branch, v);
     Found->second = m_Graph.source(m_Graph.first_in_edge(Branch));

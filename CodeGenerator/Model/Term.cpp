@@ -69,6 +69,13 @@ ValueRange rangeOfDeclaredType(ZfCCfgVariable* pVariable) {
     // Stores leave no negative zero; only code outside the optimiser's sight can have written one.
     if (!pOriginal->isVolatile())
         Range.MayBeNegativeZero = false;
+    const Variable& Declared = pOriginal->getDeclaration();
+    if (!Declared.HasBelievedRange)
+        return Range;
+    Range.Low = Declared.BelievedLow;
+    Range.High = Declared.BelievedHigh;
+    Range.MayBeNaN = false;
+    Range.MayBeNegativeZero = Range.MayBeNegativeZero && Range.Low <= 0.0 && Range.High >= 0.0;
     return Range;
 }
 

@@ -2,6 +2,7 @@
 
 #include "Model/Conversion.h"
 #include "Model/PendingWarnings.h"
+#include "Model/RewriteBudget.h"
 #include "Model/ZfCCfgSFVariable.h"
 
 #include <algorithm>
@@ -43,7 +44,7 @@ void replaceConstantReads(Term* pTerm) {
         return;
     if (pTerm->Op == Operator::Variable) {
         const ZfCCfgValue& Value = pTerm->pVariable->getValue();
-        if (Value.isConstant())
+        if (Value.isConstant() && hpn::mayRewrite("read replaced by a constant", pTerm->Position))
             becomeNumber(pTerm, Value.getValue());
         return;
     }
@@ -185,6 +186,9 @@ void ZfCCfgSFExpression::replaceConditionWithConstant(double Number) {
 ZfCCfgValue ZfCCfgSFExpression::evaluate() {
     if (isMarkedAsEvalToNonConst())
         return ZfCCfgValue(eCfgValueNonConstant);
+    hpn::RewriteBudget* pBudget = hpn::RewriteBudget::active();
+    if (pBudget != nullptr && pBudget->isHeldBack(this))
+        return ZfCCfgValue(eCfgValueNonConstant);
     if (m_IsSettled)
         return ZfCCfgValue(m_SettledNumber);
     ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
@@ -197,6 +201,8 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
             Value = ZfCCfgValue(Range.Low);
     }
     if (Value.isConstant()) {
+        if (pBudget != nullptr && !pBudget->maySettle(this, m_pRoot->Position))
+            return ZfCCfgValue(eCfgValueNonConstant);
         m_IsSettled = true;
         m_SettledNumber = Value.getValue();
     }
@@ -246,19 +252,32 @@ void ZfCCfgSFExpression::replaceConstantCondition() {
     if (hasSideEffects())
         return;
     ZfCCfgValue Value = evaluate();
-    if (Value.isConstant()) {
+    if (Value.isConstant() && m_pRoot->Op != Operator::Number &&
+        hpn::mayRewrite("condition replaced by its value", m_pRoot->Position)) {
         s_LastEvaluation.forget();
         becomeNumber(m_pRoot, Value.getValue());
     }
 }
 
+// What folding would change is seen on a copy, where that matters.
 void ZfCCfgSFExpression::foldConstants() {
     s_LastEvaluation.forget();
+    hpn::TermArena* pArena = hpn::TermArena::active();
+    if (hpn::RewriteBudget::active() != nullptr && pArena != nullptr) {
+        Term* pFolded = pArena->copy(m_pRoot);
+        hpn::foldTerm(pFolded);
+        if (hpn::isSameTerm(pFolded, m_pRoot) ||
+            !hpn::mayRewrite("expression folded", m_pRoot->Position))
+            return;
+    }
     hpn::foldTerm(m_pRoot);
 }
 
 ZfCCfgVariable* ZfCCfgSFExpression::isVariable(bool& Negated) {
-    return offeredVariable(stripNegations(m_pRoot, Negated));
+    ZfCCfgVariable* pVariable = offeredVariable(stripNegations(m_pRoot, Negated));
+    if (pVariable != nullptr && !hpn::mayRewrite("note taken from a branch", m_pRoot->Position))
+        return nullptr;
+    return pVariable;
 }
 
 bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, ZfCCfgValue& Value,
@@ -272,7 +291,8 @@ bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, Z
         std::swap(pLeft, pRight);
     ZfCCfgVariable* pRead = offeredVariable(pLeft);
     if (pRead == nullptr || pRight->Op != Operator::Number ||
-        !isTellingConstant(pRead, pRight->Number))
+        !isTellingConstant(pRead, pRight->Number) ||
+        !hpn::mayRewrite("note taken from a branch", m_pRoot->Position))
         return false;
     pVariable = pRead;
     Value = ZfCCfgValue(pRight->Number);

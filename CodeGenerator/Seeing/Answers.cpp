@@ -68,7 +68,7 @@ private:
     }
 
     void version(int Index) {
-        for (const ExplainedLine& Each : unfoldExplanation(m_Of, Index))
+        for (const ExplainedLine& Each : unfoldExplanation(m_Of, Index, m_IsTold))
             line(Each.Depth + 1, Each.Text, Each.Place);
     }
 
@@ -83,6 +83,12 @@ private:
             line(Depth, "`" + Of.Text + "`" + at(Of.Place) + " stays: " + Fate.Why, Fate.Because);
     }
 
+    static const char* verb(RecordedSaturation::Answer Answer) {
+        static const char* const Verbs[] = {"never saturates", "may saturate", "always saturates",
+                                            "is not reached"};
+        return Verbs[static_cast<std::size_t>(Answer)];
+    }
+
     void saturation(const RecordedSaturation& Of, unsigned Depth) {
         using Reply = RecordedSaturation::Answer;
         const RecordedVariable& Variable = m_Of.Variables[static_cast<std::size_t>(Of.Variable)];
@@ -94,10 +100,10 @@ private:
                                                             : "brings " + rangeText(Of.Value)) +
             ":";
         if (Variable.SaturatesLow)
-            Text += std::string(" saturates ") + nameOf(Of.Low) + " at the lower limit";
+            Text += std::string(" ") + verb(Of.Low) + " at its lower limit";
         if (Variable.SaturatesHigh)
-            Text += std::string(Variable.SaturatesLow ? "," : " saturates") + " " +
-                    nameOf(Of.High) + " at the upper limit";
+            Text += std::string(Variable.SaturatesLow ? ", " : " ") + verb(Of.High) +
+                    " at its upper limit";
         line(Depth, Text, Of.Place);
     }
 
@@ -161,6 +167,7 @@ private:
 
     const Recording& m_Of;
     std::string& m_Out;
+    std::vector<bool> m_IsTold; // versions that have been explained
 };
 
 bool parseNumber(const std::string& Text, unsigned& Number) {

@@ -732,12 +732,17 @@ std::string rangeText(const RecordedRange& Range) {
 }
 
 std::vector<ExplainedLine> unfoldExplanation(const Recording& Of, int Version) {
+    std::vector<bool> IsTold;
+    return unfoldExplanation(Of, Version, IsTold);
+}
+
+std::vector<ExplainedLine> unfoldExplanation(const Recording& Of, int Version,
+                                             std::vector<bool>& IsTold) {
     struct Pending {
         const RecordedReason* pReason;
         unsigned Depth;
     };
     std::vector<ExplainedLine> Lines;
-    std::vector<bool> IsTold(Of.Versions.size(), false);
     std::vector<Pending> Stack;
     const auto tell = [&](int Told, unsigned Depth) {
         IsTold[static_cast<std::size_t>(Told)] = true;
@@ -746,7 +751,9 @@ std::vector<ExplainedLine> unfoldExplanation(const Recording& Of, int Version) {
         for (std::size_t i = Reasons.size(); i-- != 0;)
             Stack.push_back({&Reasons[i], i == 0 ? Depth : Depth + 1});
     };
-    tell(Version, 0);
+    IsTold.resize(Of.Versions.size(), false);
+    if (!IsTold[static_cast<std::size_t>(Version)])
+        tell(Version, 0);
     while (!Stack.empty()) {
         const Pending Next = Stack.back();
         Stack.pop_back();

@@ -245,6 +245,11 @@ private:
         bool HasRemovalRun = false;
         for (const RecordedSnapshot& Each : m_Of.Snapshots)
             HasRemovalRun = HasRemovalRun || Each.Pass == UnusedPass;
+        std::unordered_set<int> IsRead; // variables
+        for (const Layout::Entry& Entry : Where.getEntries())
+            if (statement(Entry.State).MakesCode)
+                for (const RecordedRead& Read : statement(Entry.State).Reads)
+                    IsRead.insert(Read.Variable);
         for (const Layout::Entry& Entry : Where.getEntries()) {
             const RecordedStatement& Each = statement(Entry.State);
             const bool IsDefinition = Each.Form == RecordedForm::Assignment ||
@@ -255,6 +260,7 @@ private:
             RecordedFate Fate;
             Fate.Statement = Entry.State;
             Fate.Snapshot = Last.Number;
+            Fate.LooksUnused = IsRead.count(Each.Variable) == 0;
             tellWhyKept(Each, Final, HasRemovalRun, Fate);
             m_Of.Fates.push_back(std::move(Fate));
         }
@@ -300,6 +306,7 @@ private:
             for (int Reader : Final.of(Work[i])) {
                 const RecordedStatement& Each = statement(Reader);
                 if (Each.MakesCode || Each.Form == RecordedForm::Output) {
+                    Fate.GoesOn = Each.MakesCode;
                     Fate.Why = "the value goes on to `" + Each.Text + "`";
                     Fate.Because = Each.Place;
                     return;

@@ -237,6 +237,10 @@ struct RecordedFate {
     int Statement = -1; ///< index into Statements: its last state
     bool IsRemoved = false;
     unsigned Snapshot = 0; ///< number of the snapshot that lacks it first; kept ones: the last one
+    /// Of a kept one: its value reaches code that reads it, over joins, calls or steps.
+    bool GoesOn = false;
+    /// Of a kept one: no code that is left reads any version of the variable.
+    bool LooksUnused = false;
     std::string Why;
     RecordedPlace Because; ///< the place that the grounds point to; may be unknown
 };
@@ -280,8 +284,12 @@ struct ExplainedLine {
     RecordedPlace Place;
     unsigned Depth = 0;
 };
-/// Follows the explanation of a version through the versions that it names, each one once.
+/// Follows the explanation of a version through the versions that it names, each one once. The
+/// second form also leaves out what has been told before; `IsTold` goes by version and may be empty
+/// at first.
 std::vector<ExplainedLine> unfoldExplanation(const Recording& Of, int Version);
+std::vector<ExplainedLine> unfoldExplanation(const Recording& Of, int Version,
+                                             std::vector<bool>& IsTold);
 
 /// Words of the enumerations, as the JSON form writes them.
 const char* nameOf(RecordedRange::Kind Kind);

@@ -65,8 +65,9 @@ static Json toJson(const RecordedNode& Node) {
             {"place", toJson(Node.Place)}};
 }
 
+// Edges are by far the most of a recording, so they are short: from, to, kind.
 static Json toJson(const RecordedEdge& Edge) {
-    return {{"from", Edge.From}, {"to", Edge.To}, {"kind", nameOf(Edge.What)}};
+    return Json::array({Edge.From, Edge.To, nameOf(Edge.What)});
 }
 
 static Json toJson(const RecordedCall& Call) {
@@ -157,10 +158,9 @@ static Json toJson(const RecordedSaturation& Saturation) {
 }
 
 static Json toJson(const RecordedFate& Fate) {
-    return {{"statement", Fate.Statement},
-            {"isRemoved", Fate.IsRemoved},
-            {"snapshot", Fate.Snapshot},
-            {"why", Fate.Why},
+    return {{"statement", Fate.Statement},     {"isRemoved", Fate.IsRemoved},
+            {"snapshot", Fate.Snapshot},       {"goesOn", Fate.GoesOn},
+            {"looksUnused", Fate.LooksUnused}, {"why", Fate.Why},
             {"because", toJson(Fate.Because)}};
 }
 

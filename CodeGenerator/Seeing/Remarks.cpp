@@ -161,10 +161,13 @@ private:
 
     void remarkOnFate(const RecordedFate& Fate) {
         const RecordedStatement& Of = statement(Fate.Statement);
-        if (!Fate.IsRemoved)
-            return remark(m_Of, Missed, "removeUnusedVarDefs", "NotRemoved",
-                          "`" + Of.Text + "` stays though no code reads it here: " + Fate.Why,
-                          Of.Place);
+        if (!Fate.IsRemoved) {
+            if (Fate.LooksUnused && !Fate.GoesOn)
+                remark(m_Of, Missed, "removeUnusedVarDefs", "NotRemoved",
+                       "`" + Of.Text + "` stays though no code reads its variable: " + Fate.Why,
+                       Of.Place);
+            return;
+        }
         const std::string& Pass = m_Of.Snapshots[Fate.Snapshot].Pass;
         remark(m_Of, Passed, Pass.c_str(), "Removed", "`" + Of.Text + "` removed: " + Fate.Why,
                Of.Place);
