@@ -105,8 +105,15 @@ std::string reordered(const std::string& Text, Draw& Random) {
         if (startsWith(Procedures[i].front(), "proc "))
             Movable.push_back(i);
     }
-    for (std::size_t i = Movable.size(); i > 1; --i)
-        std::swap(Procedures[Movable[i - 1]], Procedures[Movable[Random.below(i)]]);
+    if (Movable.size() < 2)
+        return {};
+    std::vector<std::size_t> From = Movable;
+    std::rotate(From.begin(),
+                From.begin() + 1 + static_cast<std::ptrdiff_t>(Random.below(From.size() - 1)),
+                From.end());
+    const std::vector<Lines> Before = Procedures;
+    for (std::size_t i = 0; i < Movable.size(); ++i)
+        Procedures[Movable[i]] = Before[From[i]];
     std::string Result = textOf(Front);
     for (const Lines& Each : Procedures)
         Result += textOf(Each);
@@ -209,6 +216,18 @@ PassSequence withoutOne(const PassSequence& Of, Draw& Random) {
     return Result;
 }
 
+// Folded before constants took the place of variables, the code has more to fold the next time.
+bool foldsLast(const std::vector<PassId>& Ids) {
+    bool IsFolded = true;
+    for (const PassId Each : Ids) {
+        if (Each == PassId::ReplaceConstantConditions || Each == PassId::ReplaceConstantVariables)
+            IsFolded = false;
+        if (Each == PassId::FoldConstants)
+            IsFolded = true;
+    }
+    return IsFolded;
+}
+
 // What propagation finds is written into the code, and then once more.
 bool makeTwice(const PassSequence& Of, PassSequence& Result) {
     std::vector<PassId> Ids;
@@ -228,7 +247,7 @@ bool makeTwice(const PassSequence& Of, PassSequence& Result) {
         Ids.push_back(Each);
     }
     Ids.insert(Ids.end(), Round.begin(), Round.end());
-    return Ids.size() > Of.getPasses().size() && isAllowed(Ids, Result);
+    return Ids.size() > Of.getPasses().size() && foldsLast(Ids) && isAllowed(Ids, Result);
 }
 
 // ---- comparisons ----
