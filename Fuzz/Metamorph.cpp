@@ -281,17 +281,36 @@ std::string compareWidened(const TrialResult& Narrow, const TrialResult& Wide) {
     return {};
 }
 
+// Procedures are visited in the order of their names, and where a conclusion rests on ranges the
+// order can cost one. But no two conclusions contradict each other.
 std::string compareVersions(const TrialResult& Of, const TrialResult& Variant) {
-    if (Of.Versions.size() != Variant.Versions.size())
-        return "another number of versions";
-    for (std::size_t i = 0; i < Of.Versions.size(); ++i) {
-        const KnownVersion& a = Of.Versions[i];
-        const KnownVersion& b = Variant.Versions[i];
-        if (a.Serial != b.Serial || a.IsConstant != b.IsConstant ||
-            a.IsUndetermined != b.IsUndetermined || !isSame(a.Number, b.Number))
-            return "propagation concludes something else of " + describe(a);
+    for (const KnownVersion& Each : Of.Versions) {
+        const KnownVersion* pOther = findVersion(Variant.Versions, Each.Serial);
+        if (pOther != nullptr && Each.IsConstant && pOther->IsConstant &&
+            !isSame(Each.Number, pOther->Number))
+            return describe(Each) + " is constant, but another one";
     }
     return {};
+}
+
+// Propagation goes on for new constants only, not for ranges that have become narrower; so the
+// second time it may start from better ranges and conclude more. It must then keep what it had
+// concluded, and the code can only differ where something is new.
+std::string compareTwice(const TrialResult& Once, const TrialResult& Twice) {
+    if (Once.FinalText == Twice.FinalText)
+        return {};
+    bool IsNew = false;
+    for (const KnownVersion& Each : Once.Versions) {
+        const KnownVersion* pLater = findVersion(Twice.Versions, Each.Serial);
+        const bool IsSameConstant =
+            pLater != nullptr && pLater->IsConstant && isSame(pLater->Number, Each.Number);
+        if (Each.IsConstant && pLater != nullptr && !IsSameConstant)
+            return describe(Each) + " was constant the first time alone";
+        IsNew = IsNew || pLater == nullptr || (!Each.IsConstant && pLater->IsConstant);
+    }
+    return IsNew
+               ? std::string()
+               : "the second time changed the code\n" + Once.FinalText + "----\n" + Twice.FinalText;
 }
 
 } // namespace
@@ -336,9 +355,7 @@ std::string compareVariants(PairKind Kind, const TrialResult& Of, const TrialRes
         return "the events differ";
     if (Kind == PairKind::Renamed)
         return compareVersions(Of, Variant);
-    if (Kind == PairKind::Twice && Of.FinalText != Variant.FinalText)
-        return "the second time changed the code\n" + Of.FinalText + "----\n" + Variant.FinalText;
-    return {};
+    return Kind == PairKind::Twice ? compareTwice(Of, Variant) : std::string();
 }
 
 } // namespace hpn::fuzz

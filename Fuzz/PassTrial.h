@@ -16,12 +16,13 @@ namespace hpn::fuzz {
 /// What the program is compared with besides itself.
 enum class PairKind : std::uint8_t {
     None,
-    Renamed,   ///< every name another one: same outputs, same conclusions
+    Renamed,   ///< every name another one: same outputs, no contradicting constant
     Reordered, ///< the procedures in another order: same outputs
     DeadCode,  ///< more code, which only propagation sees to be dead: same outputs
     PassOff,   ///< one pass less: same outputs
     Widened,   ///< inputs of wider types: no constant that the narrow ones did not give
-    Twice      ///< what was found is found and written once more: same C, byte for byte
+    Twice      ///< what was found is found and written once more: same C, byte for byte, unless
+               ///< propagation concludes more from better ranges
 };
 constexpr std::size_t PairKindCount = 7;
 const char* nameOfPair(PairKind Kind);
