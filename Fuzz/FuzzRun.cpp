@@ -80,6 +80,8 @@ void addCounts(TrialCounts& To, const TrialCounts& From) {
     To.DeadNodes += From.DeadNodes;
     To.Statements += From.Statements;
     To.Exhausted += From.Exhausted;
+    for (std::size_t i = 0; i < PairKindCount; ++i)
+        To.Pairs[i] += From.Pairs[i];
 }
 
 /// How a process ended that did not end by itself, as a kind of failure.
@@ -319,6 +321,8 @@ Trial makeTrial(std::uint64_t Seed, const FuzzOptions& Options) {
     Result.ShowsInternals =
         Options.ChecksEvery != 0 && mixBits(14, Seed) % Options.ChecksEvery == 0;
     Result.WantsCode = Options.GccEvery != 0 && mixBits(15, Seed) % Options.GccEvery == 0;
+    if (Options.PairsEvery != 0 && mixBits(16, Seed) % Options.PairsEvery == 0)
+        Result.Pair = static_cast<PairKind>(1 + mixBits(17, Seed) % (PairKindCount - 1));
     return Result;
 }
 
@@ -338,6 +342,9 @@ std::string describeTotals(const FuzzTotals& Totals) {
     Text += "constants found " + number(Totals.Counts.Constants) +
             ", nodes removed by propagation " + number(Totals.Counts.DeadNodes) + "\n";
     Text += "pairs of C variants compared " + number(Totals.Compiled) + "\n";
+    for (std::size_t i = 1; i < PairKindCount; ++i)
+        Text += std::string("other program ") + nameOfPair(static_cast<PairKind>(i)) + " " +
+                number(Totals.Counts.Pairs[i]) + "\n";
     for (std::size_t i = 0; i < PassCount; ++i)
         Text += std::string("pass ") + passTable()[i].Name + " " + number(Totals.Counts.Passes[i]) +
                 "\n";
