@@ -245,8 +245,14 @@ public:
     int high() const { return m_low + size() - 1; }
     void resize(int n) { resize(0, n - 1); }
     void resize(int a, int b) {
+        array former;
+        std::swap(former.m_values, m_values);
+        former.m_low = m_low;
         m_low = a;
-        m_values.assign(std::size_t(b - a + 1), T());
+        m_values.resize(std::size_t(b - a + 1));
+        for (int i = a; i <= b; ++i)
+            if (i >= former.low() && i <= former.high())
+                (*this)[i] = former[i];
     }
 
 private:
@@ -454,6 +460,7 @@ struct node_struct {
     edge stop_out_edge_rev() const { return nullptr; }
     edge first_in_edge() const { return in.empty() ? nullptr : in.front(); }
     edge stop_in_edge() const { return nullptr; }
+    int index() const { return number; }
 
     int number = 0; // in its graph
     int serial = 0; // of all nodes of the process
@@ -466,6 +473,7 @@ struct edge_struct {
     edge pred_out_edge() const { return neighbour(ends[0]->out, this, -1); }
     edge next_in_edge() const { return neighbour(ends[1]->in, this, 1); }
     node terminal(int i) const { return ends[i]; }
+    int index() const { return number; }
 
     int number = 0;
     int serial = 0;
