@@ -11,10 +11,12 @@
 #include <cstring>
 #include <filesystem>
 #include <fstream>
+#ifndef _WIN32
 #include <sys/mman.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
+#endif
 
 // Processes: the parent watches, a child works. They share one page: the seed in hand, a counter
 // that shows life, the totals, and the failure that the child has stopped at. So nothing that a
@@ -23,6 +25,7 @@
 
 namespace hpn::fuzz {
 
+#ifndef _WIN32
 namespace {
 
 using Clock = std::chrono::steady_clock;
@@ -312,6 +315,11 @@ private:
 
 } // namespace
 
+FuzzTotals runFuzz(const FuzzOptions& Options) {
+    return Fuzzer(Options).run();
+}
+#endif
+
 Trial makeTrial(std::uint64_t Seed, const FuzzOptions& Options) {
     Trial Result;
     Result.Text = Seed % 16 == 15 ? RandomProgram(static_cast<unsigned>(Seed)).text()
@@ -324,10 +332,6 @@ Trial makeTrial(std::uint64_t Seed, const FuzzOptions& Options) {
     if (Options.PairsEvery != 0 && mixBits(16, Seed) % Options.PairsEvery == 0)
         Result.Pair = static_cast<PairKind>(1 + mixBits(17, Seed) % (PairKindCount - 1));
     return Result;
-}
-
-FuzzTotals runFuzz(const FuzzOptions& Options) {
-    return Fuzzer(Options).run();
 }
 
 std::string describeTotals(const FuzzTotals& Totals) {

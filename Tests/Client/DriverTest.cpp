@@ -82,10 +82,12 @@ TEST(Driver, ReplacesTheOutputWholeAndLeavesNothingElseBehind) {
     DriverRun Run;
     Run.write("small.hpn", Small);
     Run.write("real.c", "old");
-    std::filesystem::create_symlink("real.c", Run.directory() + "/link.c");
-    ASSERT_EQ(Run.run("small.hpn -o link.c"), 0) << Run.errors();
+    std::error_code NoLinks; // not every system lets everyone make them
+    std::filesystem::create_symlink("real.c", Run.directory() + "/link.c", NoLinks);
+    const std::string Target = NoLinks ? "real.c" : "link.c";
+    ASSERT_EQ(Run.run("small.hpn -o " + Target), 0) << Run.errors();
     EXPECT_TRUE(contains(Run.read("real.c"), "small_step"));
-    EXPECT_TRUE(std::filesystem::is_symlink(Run.directory() + "/link.c"));
+    EXPECT_TRUE(NoLinks || std::filesystem::is_symlink(Run.directory() + "/link.c"));
     for (const auto& [Name, Text] : Run.files())
         EXPECT_FALSE(contains(Name, ".tmp")) << Name;
 }
@@ -108,7 +110,7 @@ TEST(Driver, StandardInputAndOutputCarryTheSameProgramAsFiles) {
     const std::string Compile = "cd " + Run.directory() +
                                 "/alone && gcc -std=c99 -Wall -Wextra "
                                 "-Werror -O2 -c small.c";
-    EXPECT_EQ(std::system(Compile.c_str()), 0);
+    EXPECT_EQ(hostshell::status(Compile), 0);
 }
 
 TEST(Driver, ReportsGoBesideTheCodeAndNotIntoIt) {
@@ -185,7 +187,7 @@ TEST(Driver, RunsUnderDifferentAddressesGiveIdenticalBytes) {
         "", "env PADDING=$(head -c 40000 /dev/zero | tr '\\0' x)",
         "env MALLOC_ARENA_MAX=1 MALLOC_MMAP_THRESHOLD_=64 MALLOC_PERTURB_=85"};
     // Not allowed in every container.
-    if (std::system("setarch -R true 2>/dev/null") == 0)
+    if (hostshell::status("setarch -R true 2>/dev/null") == 0)
         Surroundings.push_back("setarch -R");
     std::map<std::string, std::string> First;
     for (const char* Before : Surroundings) {
