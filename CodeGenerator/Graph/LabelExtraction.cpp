@@ -184,7 +184,7 @@ void LabelExtraction::extract(const LabelPlace& Label) {
         return;
     if (const char* pWhy = findObstacle(Label))
         return refuse(Label, pWhy);
-    if (!mayRewrite("procedure made of a label", Label.pLabel->Position))
+    if (!mayRewrite("procedure made of a label", Label.Position))
         return;
     // The call that the library gives back would be one more than there were jumps.
     ZfCCfgFactory::getInstance()->delStatement(m_Graph.makeProcedureAndCall(Label.Node));
