@@ -222,7 +222,7 @@ std::string CodeBatch::run(const std::string& Directory, const std::string& Runt
     std::ofstream(Directory + "/batch.c", std::ios::binary) << Source;
     const std::string Command = "cd '" + Directory + "' && gcc -std=c99 -O1 -Wall -Wextra -Werror -I'" +
                                 RuntimeDirectory +
-                                "' batch.c -o batch >messages 2>&1 && timeout 20 ./batch";
+                                "' batch.c -o batch >messages 2>&1 && timeout 120 ./batch";
     int Status = 0;
     const std::string Output = hostshell::run(Command, Status);
     std::string Difference = checkOutput(Output);

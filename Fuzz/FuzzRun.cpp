@@ -9,6 +9,7 @@
 #include <csignal>
 #include <cstdio>
 #include <cstring>
+#include <ctime>
 #include <filesystem>
 #include <fstream>
 #ifndef _WIN32
@@ -32,6 +33,7 @@ using Clock = std::chrono::steady_clock;
 
 constexpr unsigned BatchSize = 8;
 constexpr unsigned MostAttempts = 6000;
+constexpr double SleepSeconds = 600.0; // for a process that does nothing
 constexpr double PatienceSeconds = 20.0;
 constexpr double AnswerSeconds = 5.0;
 constexpr double HangSeconds =
@@ -93,6 +95,16 @@ std::string describeEnd(int Status, bool IsStuck) {
         return Hang;
     return WIFSIGNALED(Status) ? std::string("crash: ") + ::strsignal(WTERMSIG(Status))
                                : "crash: exit status";
+}
+
+/// How long a process has held a core: unlike the time on the wall it says whether it hangs,
+/// however busy the machine is.
+double coreSeconds(pid_t Process) {
+    clockid_t Id;
+    timespec Time{};
+    if (::clock_getcpuclockid(Process, &Id) != 0 || ::clock_gettime(Id, &Time) != 0)
+        return 0.0;
+    return static_cast<double>(Time.tv_sec) + static_cast<double>(Time.tv_nsec) * 1e-9;
 }
 
 class Fuzzer {
@@ -160,14 +172,17 @@ private:
     int watch(pid_t Child, bool& IsStuck) {
         std::uint64_t Life = m_Shared->Life;
         Clock::time_point Seen = Clock::now();
+        double Held = coreSeconds(Child);
         int Status = 0;
         while (::waitpid(Child, &Status, WNOHANG) == 0) {
             ::usleep(20000);
             if (m_Shared->Life != Life) {
                 Life = m_Shared->Life;
                 Seen = Clock::now();
+                Held = coreSeconds(Child);
             }
-            if (seconds(Seen) < PatienceSeconds)
+            // A process that waits for the C compiler holds no core.
+            if (coreSeconds(Child) - Held < PatienceSeconds && seconds(Seen) < SleepSeconds)
                 continue;
             IsStuck = true;
             ::kill(Child, SIGKILL);
@@ -239,7 +254,7 @@ private:
         bool IsStuck = false;
         while (::waitpid(Child, &Status, WNOHANG) == 0) {
             ::usleep(200);
-            if (seconds(Asking) < Patience || IsStuck)
+            if ((coreSeconds(Child) < Patience && seconds(Asking) < SleepSeconds) || IsStuck)
                 continue;
             IsStuck = true;
             ::kill(Child, SIGKILL);

@@ -26,6 +26,7 @@
 #include <climits>
 #include <map>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "ZfCControlFlowGraph.h"
@@ -90,9 +91,11 @@ private:
             Changed = false;
             for (leda::node v : m_Reached) {
                 leda::node Idom = nullptr;
-                for (leda::edge e : inEdges(v)) {
+                for (leda::edge e = m_Graph.first_in_edge(v); e != nullptr;
+                     e = m_Graph.in_succ(e)) {
                     leda::node u = m_Graph.source(e);
-                    if (isReached(u) && (m_Idom[index(u)] != nullptr || isEntry(u)))
+                    if (isControlFlow(e) && isReached(u) &&
+                        (m_Idom[index(u)] != nullptr || isEntry(u)))
                         Idom = Idom == nullptr ? u : meet(Idom, u);
                 }
                 Changed = Changed || m_Idom[index(v)] != Idom;
@@ -128,6 +131,7 @@ private:
     }
 
     void collectDefinitions() {
+        m_Definitions.reserve(std::size_t(m_Graph.number_of_nodes()));
         for (leda::node v = m_Graph.first_node(); v != nullptr; v = m_Graph.next_node(v)) {
             ZfCBasicBlock* pBlock = m_Graph.inf(v)->isBasicBlock();
             if (isEntry(v))
@@ -280,9 +284,9 @@ private:
     Strictness m_Asked;
     std::vector<int> m_Number;
     std::vector<leda::node> m_Idom;
-    std::vector<leda::node> m_Reached; // in reverse postorder
-    std::map<ZfCCfgVariable*, Place> m_Definitions;
-    std::map<ZfCCfgProcedureCall*, Place> m_Calls;
+    std::vector<leda::node> m_Reached;                        // in reverse postorder
+    std::unordered_map<ZfCCfgVariable*, Place> m_Definitions; // looked up only, as the next
+    std::unordered_map<ZfCCfgProcedureCall*, Place> m_Calls;
     std::map<std::string, ZfCCfgProcedure*> m_Procedures;
     std::string m_Violations;
 };
