@@ -110,6 +110,7 @@ TEST_F(Factory, RecycledBlockIsCleanButRecycledEntryKeepsItsPast) {
     ZfCCfgProcedure* const pProcedure = factory().createProcedure();
     ZfCBasicBlock* const pBlock = factory().createBasicBlock();
     ZfCCfgEntry* const pEntry = factory().createEntryNode();
+    ZfCCfgExit* const pExit = factory().createExitNode();
     pBlock->append(new ZfCCfgInitAssignment);
     pBlock->append(new ZfCPhiFunction(nullptr, 0));
     pBlock->appendBranch(factory().createValueExpression());
@@ -121,16 +122,18 @@ TEST_F(Factory, RecycledBlockIsCleanButRecycledEntryKeepsItsPast) {
         pNodeInfo->getDF()->insert(v);
         factory().delNodeInfo(pNodeInfo);
     }
+    factory().delNodeInfo(pExit);
+    EXPECT_EQ(pExit, factory().createExitNode());
     EXPECT_EQ(1u, pEntry->getIndex());
     EXPECT_EQ(pBlock, factory().createBasicBlock());
     EXPECT_EQ(pEntry, factory().createEntryNode());
-    EXPECT_EQ(2u, pBlock->getIndex());
+    EXPECT_EQ(4u, pBlock->getIndex());
     EXPECT_TRUE(pBlock->isEmpty());
     EXPECT_TRUE(pBlock->getAssignedVariables().empty());
     EXPECT_EQ(nullptr, pBlock->getProcedure());
     EXPECT_EQ(nullptr, pBlock->getIdom());
     EXPECT_TRUE(pBlock->getDF()->empty());
-    EXPECT_EQ(3u, pEntry->getIndex());
+    EXPECT_EQ(5u, pEntry->getIndex());
     EXPECT_EQ(pProcedure, pEntry->getProcedure());
     EXPECT_EQ(v, pEntry->getIdom());
     EXPECT_TRUE(pEntry->getDF()->member(v));
@@ -220,6 +223,13 @@ TEST_F(Factory, ReleaseEndsClientExpressionsBeforeStatementsAndTheseInOrderOfCre
     factory().delLedaList_Node(factory().createLedaList_Node());
     factory().createLedaList_Node()->append(nullptr); // left to the release
     factory().delLedaList_Node(nullptr);
+    // What is parked when the factory empties goes too: the leak checker watches.
+    Variable v;
+    factory().delSSAVariable(factory().createSSAVariable(&v));
+    factory().delExplicitVarUse(factory().createExplicitVarUse());
+    factory().delEntryNode(factory().createEntryNode());
+    factory().delExitNode(factory().createExitNode());
+    factory().delProcedure(factory().createProcedure());
     EXPECT_EQ((std::vector<std::string>{"ended"}), Deaths);
     factory().releaseAllMemory();
     EXPECT_EQ((std::vector<std::string>{"ended", "client", "first", "last"}), Deaths);

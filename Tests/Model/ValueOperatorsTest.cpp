@@ -387,6 +387,19 @@ TEST(Cast, FloatsKeepTheirNumberAndBooleansAreNormalizedOnDemand) {
     }
 }
 
+TEST(Cast, ARepresentedValueLiesOnTheGridOfTheScaling) {
+    ZfCLinearScaling Half(0.5, 0.0);
+    for (ZF_Scaling* pScaling :
+         {static_cast<ZF_Scaling*>(nullptr), static_cast<ZF_Scaling*>(&Half)}) {
+        ZfCCfgValue Rounded = 3.3;
+        ZfCCfgValue Cut = 3.3;
+        Rounded.changeToRepresentedValue(pScaling);
+        Cut.changeToRepresentedValueDontRound(pScaling);
+        EXPECT_CONSTANT(pScaling != nullptr ? 3.5 : 3.3, Rounded);
+        EXPECT_CONSTANT(pScaling != nullptr ? 3.0 : 3.3, Cut);
+    }
+}
+
 TEST(Cast, WithoutTypeOrBaseTypeNothingChanges) {
     NamedType WithoutBase("int8");
     ZfCCfgValue Value = 300.5;
