@@ -260,6 +260,12 @@ TEST(Set, BehavesAsTheStandardsAtEverySize) {
                 ASSERT_EQ(*copy.begin(), -1);
             }
         }
+        for (; !model.empty(); model.erase(model.begin())) { // a large set that shrinks
+            if (model.size() < 100) {
+                ASSERT_EQ(elements(leda::set<int>(s)), vectorOf(model));
+            }
+            s.del(*model.begin());
+        }
     }
 }
 

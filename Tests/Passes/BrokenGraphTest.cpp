@@ -124,6 +124,24 @@ std::vector<BrokenPlace> formPlaces() {
              P.toSSA();
              return P.valuesOf("x") == "top top";
          }},
+        // A call that does not stand alone: only the first statement of a block is inlined.
+        {"inlining behind a statement", "proc main { x = 1; } proc f { }", 0,
+         "StmtList.size() == 1;",
+         [](Program& P) {
+             P.blockOf(behind(P, mainEntry(P)))->append(new ZfCCfgProcedureCall("f"));
+             P.graph().placeExitNodes();
+             P.graph().inlineProcedures();
+             return P.calls().size() == 1;
+         }},
+        {"inlining of two calls", "proc main { } proc f { } proc g { }", 0,
+         "StmtList.size() == 1;StmtList.size() == 1;",
+         [](Program& P) {
+             for (char const* Name : {"f", "g"})
+                 P.blockOf(behind(P, mainEntry(P)))->append(new ZfCCfgProcedureCall(Name));
+             P.graph().placeExitNodes();
+             P.graph().inlineProcedures();
+             return P.calls().empty();
+         }},
         {"a statement of no kind", "proc main { x = 1; }", 0, "",
          [](Program& P) {
              P.blockOf(behind(P, mainEntry(P)))->append(new StrangeStatement);
