@@ -102,6 +102,10 @@ void declareOptions(CLI::App& App, Options& Result, Words& Given) {
     App.add_option("--rewrite-limit", Result.RewriteLimit,
                    "Let the first N single changes happen and no more (see Scripts/bisect)")
         ->type_name("N");
+    App.add_option("--report", Result.ReportDirectory,
+                   "Write a page for the browser, index.html, that shows the run: passes, graphs, "
+                   "ranges, explanations")
+        ->type_name("DIR");
     App.add_option("--record", Result.RecordFile,
                    "Write everything about the run as JSON, for tools")
         ->type_name("FILE");

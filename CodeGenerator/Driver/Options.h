@@ -27,8 +27,9 @@ struct Options {
     bool IsChangesWanted = false;
     static constexpr std::size_t NoLimit = static_cast<std::size_t>(-1);
     std::size_t RewriteLimit = NoLimit;
-    Assumptions Assumed;    ///< --set and --range
-    std::string RecordFile; ///< the recording as JSON; empty: none
+    Assumptions Assumed;         ///< --set and --range
+    std::string RecordFile;      ///< the recording as JSON; empty: none
+    std::string ReportDirectory; ///< of the page that shows the run; empty: none
     StatisticsForm Statistics = StatisticsForm::None;
     bool IsTimeWanted = false;
     bool IsCheckWanted = false;
@@ -37,8 +38,8 @@ struct Options {
 
     /// Something is asked for that is answered from a recording.
     bool isRecordingWanted() const {
-        return !RecordFile.empty() || !Questions.empty() || IsChangesWanted ||
-               Remarks != StatisticsForm::None;
+        return !RecordFile.empty() || !ReportDirectory.empty() || !Questions.empty() ||
+               IsChangesWanted || Remarks != StatisticsForm::None;
     }
     bool isRewriteLimited() const { return RewriteLimit != NoLimit; }
     bool isOutputToFile() const { return !OutputFile.empty() && OutputFile != "-"; }

@@ -17,6 +17,7 @@
 #include "Seeing/Answers.h"
 #include "Seeing/Recorder.h"
 #include "Seeing/Remarks.h"
+#include "Seeing/Report.h"
 
 #include <cstdio>
 #include <filesystem>
@@ -234,7 +235,8 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& 
     Source.dropBodies();
     PassRunner Runner(Graph);
     Watchers Watching(Wanted, Sources, Runner, Errors);
-    if (!makeDirectory(Wanted.DotDirectory) || !makeDirectory(Wanted.HtmlDirectory))
+    if (!makeDirectory(Wanted.DotDirectory) || !makeDirectory(Wanted.HtmlDirectory) ||
+        !makeDirectory(Wanted.ReportDirectory))
         return ExitWrongUse;
     const bool IsRun = Runner.run(Wanted.Passes);
     printWarnings(Sources);
@@ -263,6 +265,10 @@ ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& 
     FurtherFiles Further;
     if (!Wanted.RecordFile.empty())
         Further.emplace_back(Wanted.RecordFile, recordingToJson(Watching.Record.getRecording()));
+    if (!Wanted.ReportDirectory.empty())
+        Further.emplace_back(
+            (std::filesystem::path(Wanted.ReportDirectory) / "index.html").string(),
+            makeReport(Watching.Record.getRecording()));
     return writeResults(Wanted, Code,
                         Watching.report(Wanted, Sources, Source, pWithout) + Rewrites + Answers,
                         Further);

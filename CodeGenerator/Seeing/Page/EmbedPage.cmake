@@ -1,0 +1,10 @@
+# Writes the texts of the page in DIRECTORY as strings of namespace hpn into the C++ source OUTPUT.
+file(WRITE ${OUTPUT} "namespace hpn {\n")
+foreach(PAIR ReportTemplate=page.html ReportStyle=page.css ReportScript=page.js)
+  string(REPLACE "=" ";" PAIR ${PAIR})
+  list(GET PAIR 0 NAME)
+  list(GET PAIR 1 FILE)
+  file(READ ${DIRECTORY}/${FILE} TEXT)
+  file(APPEND ${OUTPUT} "extern const char* const ${NAME};\nconst char* const ${NAME} = R\"hpn-page(${TEXT})hpn-page\";\n")
+endforeach()
+file(APPEND ${OUTPUT} "}\n")
