@@ -306,7 +306,8 @@ std::string compareTwice(const TrialResult& Once, const TrialResult& Twice) {
             pLater != nullptr && pLater->IsConstant && isSame(pLater->Number, Each.Number);
         if (Each.IsConstant && pLater != nullptr && !IsSameConstant)
             return describe(Each) + " was constant the first time alone";
-        IsNew = IsNew || pLater == nullptr || (!Each.IsConstant && pLater->IsConstant);
+        IsNew = IsNew || pLater == nullptr || (!Each.IsConstant && pLater->IsConstant) ||
+                !isSame(Each.Number, pLater->Number) || !isSame(Each.Highest, pLater->Highest);
     }
     return IsNew
                ? std::string()

@@ -209,7 +209,7 @@ private:
             const auto Slot = static_cast<std::size_t>(Each.Slot);
             Kept.push_back({Each.Serial, std::string(Code.SlotVariables[Slot]->Name),
                             Each.Claimed.What == Claim::Kind::Constant, Each.IsUndetermined,
-                            Each.Claimed.Low});
+                            Each.Claimed.Low, Each.Claimed.High});
         }
         std::sort(Kept.begin(), Kept.end(),
                   [](const KnownVersion& a, const KnownVersion& b) { return a.Serial < b.Serial; });

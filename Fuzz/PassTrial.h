@@ -66,7 +66,8 @@ struct KnownVersion {
     std::string Name; ///< of the variable
     bool IsConstant = false;
     bool IsUndetermined = false;
-    double Number = 0.0;
+    double Number = 0.0; ///< or the lower end of its range
+    double Highest = 0.0;
 };
 
 struct TrialCounts {
