@@ -154,10 +154,14 @@ TEST_F(Factory, RecycledVersionSortsByTheNumberOfItsFirstLife) {
     ZfCSSAVariable* const pOld = factory().createSSAVariable(&v);
     ZfCSSAVariable* const pYoung = factory().createSSAVariable(&v);
     pOld->markAsVolatile();
+    pOld->markAsErasable();
+    pOld->markAsArray();
     pOld->pushSSAReplacement(pYoung);
     pOld->appendVirtualAlias(pYoung);
     pOld->setMinValueAndDestroyOld(ZfCCfgValue(1.0));
     factory().delSSAVariable(pOld);
+    EXPECT_EQ(0u, pOld->getIndex());
+    EXPECT_FALSE(pOld->isErasable() || pOld->isArray() || pOld->isVolatile());
     EXPECT_EQ(nullptr, pOld->getOrigVar());
     EXPECT_EQ(nullptr, pOld->getNonVirtualAlias());
     EXPECT_EQ(pOld, factory().createSSAVariable(pYoung));
@@ -166,7 +170,8 @@ TEST_F(Factory, RecycledVersionSortsByTheNumberOfItsFirstLife) {
     EXPECT_EQ(&v, pOld->getOrigVar());
     EXPECT_EQ(pOld, pOld->getNonVirtualAlias());
     EXPECT_EQ(nullptr, pOld->topSSAReplacement());
-    EXPECT_FALSE(pOld->isVolatile());
+    EXPECT_FALSE(pOld->isVolatile() || pOld->isErasable() || pOld->isArray());
+    EXPECT_EQ(0, pOld->countAllUses());
     EXPECT_TRUE(pOld->getValue().isUndetermined());
     EXPECT_TRUE(pOld->getMinValue().isUndetermined());
     VariableSet Set;

@@ -11,43 +11,47 @@ using Messages = ZfCCodeGenMessage;
 TEST(Message, EachEntrySendsItsSeverityNumberCategoryAndText) {
     Reports Received;
     const ZfCSrcRef SrcRef("a.hpn", 3, 4);
-    Messages::putCodeGenMessage10000("A", "B");
-    Messages::putCodeGenMessage10001();
-    Messages::putCodeGenMessage10002("A", 0.25);
-    Messages::putCodeGenMessage10003("A");
-    Messages::putCodeGenMessage10004("A", "B");
-    Messages::putCodeGenMessage10005("A");
-    Messages::putCodeGenMessage10006(7);
-    Messages::putCodeGenMessage10007("A", 7);
-    Messages::putCodeGenMessage10008(&SrcRef, "A", 7);
-    Messages::putCodeGenMessage10011();
-    Messages::putCodeGenMessage10012(&SrcRef, "A");
-    Messages::putCodeGenMessage10013();
-    Messages::putCodeGenMessage10014();
-    Messages::putCodeGenMessage10015();
-    Messages::putCodeGenMessage10016();
-    Messages::putCodeGenMessage10017(&SrcRef, "A");
-    Messages::putCodeGenMessage10018();
-    Messages::putCodeGenMessage10020("A");
-    Messages::putCodeGenMessage10021();
-    Messages::putCodeGenMessage10022("A");
-    Messages::putCodeGenMessage10023();
-    Messages::putCodeGenMessage10024("A", "B");
-    Messages::putCodeGenMessage10025();
-    Messages::putCodeGenMessage10026("A", "B");
-    Messages::putCodeGenMessage10027("A", "B", "C");
-    Messages::putCodeGenMessage10028("A");
-    Messages::putCodeGenMessage10029("A");
-    Messages::putCodeGenMessage10030();
-    Messages::putCodeGenMessage21652(&SrcRef, "A");
-    Messages::putCodeGenMessage32008(&SrcRef, "A");
-    Messages::putCodeGenMessage32118(&SrcRef, "A", "B");
-    Messages::putCodeGenMessage32221(&SrcRef, "A", "B", "C");
-    Messages::putCodeGenMessage32300(&SrcRef, "A");
-    Messages::putCodeGenMessage99066();
-    Messages::putCodeGenMessage99067();
-    Messages::putCodeGenMessage99068();
-    Messages::putCodeGenMessage99069();
+    const bool AreSent[] = {
+        Messages::putCodeGenMessage10000("A", "B"),
+        Messages::putCodeGenMessage10001(),
+        Messages::putCodeGenMessage10002("A", 0.25),
+        Messages::putCodeGenMessage10003("A"),
+        Messages::putCodeGenMessage10004("A", "B"),
+        Messages::putCodeGenMessage10005("A"),
+        Messages::putCodeGenMessage10006(7),
+        Messages::putCodeGenMessage10007("A", 7),
+        Messages::putCodeGenMessage10008(&SrcRef, "A", 7),
+        Messages::putCodeGenMessage10011(),
+        Messages::putCodeGenMessage10012(&SrcRef, "A"),
+        Messages::putCodeGenMessage10013(),
+        Messages::putCodeGenMessage10014(),
+        Messages::putCodeGenMessage10015(),
+        Messages::putCodeGenMessage10016(),
+        Messages::putCodeGenMessage10017(&SrcRef, "A"),
+        Messages::putCodeGenMessage10018(),
+        Messages::putCodeGenMessage10020("A"),
+        Messages::putCodeGenMessage10021(),
+        Messages::putCodeGenMessage10022("A"),
+        Messages::putCodeGenMessage10023(),
+        Messages::putCodeGenMessage10024("A", "B"),
+        Messages::putCodeGenMessage10025(),
+        Messages::putCodeGenMessage10026("A", "B"),
+        Messages::putCodeGenMessage10027("A", "B", "C"),
+        Messages::putCodeGenMessage10028("A"),
+        Messages::putCodeGenMessage10029("A"),
+        Messages::putCodeGenMessage10030(),
+        Messages::putCodeGenMessage21652(&SrcRef, "A"),
+        Messages::putCodeGenMessage32008(&SrcRef, "A"),
+        Messages::putCodeGenMessage32118(&SrcRef, "A", "B"),
+        Messages::putCodeGenMessage32221(&SrcRef, "A", "B", "C"),
+        Messages::putCodeGenMessage32300(&SrcRef, "A"),
+        Messages::putCodeGenMessage99066(),
+        Messages::putCodeGenMessage99067(),
+        Messages::putCodeGenMessage99068(),
+        Messages::putCodeGenMessage99069(),
+    };
+    for (bool IsSent : AreSent)
+        EXPECT_TRUE(IsSent);
     EXPECT_EQ(Received.m_Text, R"(0 10000 General Messages|A Production Code Generator Version B
 0 10001 General Messages|HpnSSA Production Code Generator. Copyright by its authors. All rights reserved.
 0 10002 General Messages|A                              in    0.25 seconds.

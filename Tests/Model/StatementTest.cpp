@@ -334,6 +334,8 @@ TEST_F(StatementTest, ProcedureStaysCallableFromOutsideOnceACallSaysSo) {
     p->appendCall(new ZfCCfgProcedureCall("f"));
     EXPECT_TRUE(p->isDirectlyOrIndirectlyCallableFromOutside());
     EXPECT_EQ(3, p->getCalls().size());
+    EXPECT_EQ(pMarked, elements(p->getCalls())[1]); // in the order of the calls
+    p->appendUsedVariable(&c);
     p->appendDefinedVariable(&a);
     p->getDefinedVariables().insert(&b); // changes a copy
     EXPECT_EQ(1, p->getDefinedVariables().size());
@@ -343,6 +345,8 @@ TEST_F(StatementTest, ProcedureStaysCallableFromOutsideOnceACallSaysSo) {
     p->setEntryNode(v);
     p->resetData();
     EXPECT_STREQ("", p->getName().cstring());
+    EXPECT_TRUE(p->getCalls().empty() && p->getUsedVariables().empty());
+    EXPECT_FALSE(p->isDirectlyOrIndirectlyCallableFromOutside());
     EXPECT_EQ(v, p->getEntryNode()); // nodes stay while parked
     p->initData();
     EXPECT_EQ(nullptr, p->getEntryNode());
