@@ -247,20 +247,26 @@ TEST(Driver, CruiseControlLosesTheOptionThatThisVehicleLacks) {
     EXPECT_TRUE(contains(Run.output(), "HAS_RESUME"));
 }
 
-// The first two C blocks of the README, before and after, are what the tool gives for its first
-// program text.
+// The C before and after that the README shows is what the tool gives for the program above it.
 TEST(Driver, ReadmeShowsWhatTheToolGives) {
     const std::string Readme = DriverRun::readFile(HPNSSA_SOURCE_DIR "/README.md");
-    const auto blockOf = [&Readme](const std::string& Opening) {
-        const std::size_t Begin = Readme.find(Opening) + Opening.size();
-        return Readme.substr(Begin, Readme.find("```", Begin) - Begin);
+    std::size_t At = 0;
+    const auto blockOf = [&](const std::string& Opening, const std::string& Closing) {
+        const std::size_t Begin = Readme.find(Opening, At) + Opening.size();
+        At = Readme.find(Closing, Begin);
+        std::string Text = Readme.substr(Begin, At - Begin);
+        for (std::size_t Break = 0; (Break = Text.find("<br>")) != std::string::npos;)
+            Text.replace(Break, 4, "\n");
+        return Text;
     };
     DriverRun Run;
-    Run.write("heater.hpn", blockOf("```text\n"));
-    ASSERT_EQ(Run.run("heater.hpn"), 0) << Run.errors();
-    const std::string Shown = blockOf("```c\n");
-    ASSERT_FALSE(Shown.empty());
-    EXPECT_TRUE(contains(Run.output(), Shown)) << Run.output();
+    Run.write("option.hpn", blockOf("```text\n", "```"));
+    for (const char* Options : {"option.hpn --no-optimize", "option.hpn"}) {
+        const std::string Shown = blockOf("<pre>", "</pre>");
+        ASSERT_TRUE(contains(Shown, "void option_step(void)")) << Shown;
+        ASSERT_EQ(Run.run(Options), 0) << Run.errors();
+        EXPECT_TRUE(contains(Run.output(), Shown)) << Run.output();
+    }
 }
 
 } // namespace

@@ -73,6 +73,8 @@ int call(const T&, const T&, long) {
 // it goes in front of the first use of a container with that element type. Containers then read
 // each element's number once instead of comparing pairs, which makes merging several times faster.
 // Types without it, and pointers to derived classes, are compared pair by pair.
+// LEDA_ORDER_NUMBERS says that there is such a thing, for code that also runs on other layers.
+#define LEDA_ORDER_NUMBERS 1
 template <class T>
 struct order_number {
     static constexpr bool known = std::is_integral_v<T> && sizeof(T) <= 4;

@@ -16,9 +16,10 @@ class ZfCCfgVariable;
 class ZfCCfgVisitor;
 class ZfCSSAVariable;
 
+#ifdef LEDA_ORDER_NUMBERS
 namespace leda {
 
-// Lets sets of variables merge by number; as compare below.
+// Lets sets of variables merge by number, where the layer below knows how; as compare below.
 template <>
 struct order_number<ZfCCfgVariable*> {
     static constexpr bool known = true;
@@ -26,6 +27,7 @@ struct order_number<ZfCCfgVariable*> {
 };
 
 } // namespace leda
+#endif
 
 // A variable of the intermediate code.
 //
@@ -162,15 +164,21 @@ private:
 
 namespace leda {
 
+#ifdef LEDA_ORDER_NUMBERS
 inline std::int64_t order_number<ZfCCfgVariable*>::of(ZfCCfgVariable* const& pVariable) {
     return pVariable != nullptr ? pVariable->getDebugIndex()
                                 : std::numeric_limits<std::int64_t>::min();
 }
+#endif
 
 // Order of sets of variables: null first, then by debug index.
 inline int compare(ZfCCfgVariable* const& pLeft, ZfCCfgVariable* const& pRight) {
-    const std::int64_t Left = order_number<ZfCCfgVariable*>::of(pLeft);
-    const std::int64_t Right = order_number<ZfCCfgVariable*>::of(pRight);
+    if (pLeft == pRight)
+        return 0;
+    if (pLeft == nullptr || pRight == nullptr)
+        return pLeft == nullptr ? -1 : 1;
+    const int Left = pLeft->getDebugIndex();
+    const int Right = pRight->getDebugIndex();
     return (Left > Right) - (Left < Right);
 }
 

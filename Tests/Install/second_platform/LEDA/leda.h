@@ -460,7 +460,6 @@ struct node_struct {
     edge stop_out_edge_rev() const { return nullptr; }
     edge first_in_edge() const { return in.empty() ? nullptr : in.front(); }
     edge stop_in_edge() const { return nullptr; }
-    int index() const { return number; }
 
     int number = 0; // in its graph
     int serial = 0; // of all nodes of the process
@@ -473,7 +472,6 @@ struct edge_struct {
     edge pred_out_edge() const { return neighbour(ends[0]->out, this, -1); }
     edge next_in_edge() const { return neighbour(ends[1]->in, this, 1); }
     node terminal(int i) const { return ends[i]; }
-    int index() const { return number; }
 
     int number = 0;
     int serial = 0;
