@@ -220,9 +220,9 @@ std::string CodeBatch::run(const std::string& Directory, const std::string& Runt
         Source += "    " + Each.Prefix + "run();\n";
     Source += "    printf(\"\\n# end\\n\");\n    return 0;\n}\n";
     std::ofstream(Directory + "/batch.c", std::ios::binary) << Source;
-    const std::string Command = "cd '" + Directory + "' && gcc -std=c99 -O1 -Wall -Wextra -Werror -I'" +
-                                RuntimeDirectory +
-                                "' batch.c -o batch >messages 2>&1 && timeout 120 ./batch";
+    const std::string Command =
+        "cd '" + Directory + "' && gcc -std=c99 -O1 -Wall -Wextra -Werror -I'" + RuntimeDirectory +
+        "' batch.c -o batch >messages 2>&1 && timeout 120 ./batch";
     int Status = 0;
     const std::string Output = hostshell::run(Command, Status);
     std::string Difference = checkOutput(Output);

@@ -1,7 +1,8 @@
 #include "ZfCScaleTool.h"
 
 #include "ZF_Scaling.h"
-#include "ZfCLinearScaling.h" // has no source of its own, and a DLL holds only what a source sees
+// It has no source of its own, and a DLL holds only what a source sees.
+#include "ZfCLinearScaling.h"
 
 #include <cmath>
 

@@ -31,6 +31,8 @@ public:
 };
 
 // The optimiser's own checks are always on here.
-inline bool ShowInternalInfo() { return true; }
+inline bool ShowInternalInfo() {
+    return true;
+}
 
 #endif

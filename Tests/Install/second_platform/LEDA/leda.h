@@ -425,9 +425,7 @@ public:
     const K& key(item it) const { return it.at()->first; }
     const V& inf(item it) const { return it.at()->second; }
     V& inf(item it) { return it.at()->second; }
-    item insert(const K& k, const V& v) {
-        return item(m_values.insert_or_assign(k, v).first);
-    }
+    item insert(const K& k, const V& v) { return item(m_values.insert_or_assign(k, v).first); }
     void del(const K& k) { m_values.erase(k); }
     void del_item(item it) { m_values.erase(it.at()); }
     int size() const { return int(m_values.size()); }
@@ -486,8 +484,12 @@ int order_of_handles(Handle a, Handle b) {
     return a->number != b->number ? (a->number > b->number) - (a->number < b->number)
                                   : (a->serial > b->serial) - (a->serial < b->serial);
 }
-inline int compare(const node& a, const node& b) { return order_of_handles(a, b); }
-inline int compare(const edge& a, const edge& b) { return order_of_handles(a, b); }
+inline int compare(const node& a, const node& b) {
+    return order_of_handles(a, b);
+}
+inline int compare(const edge& a, const edge& b) {
+    return order_of_handles(a, b);
+}
 
 class graph {
 public:
@@ -686,7 +688,6 @@ private:
 };
 
 } // namespace leda
-
 
 #include "LEDA/graph_alg.h"
 
