@@ -1,5 +1,5 @@
 "use strict";
-// Shows a recorded run. Each part of the data is read when a view first needs it. Numbers that name things are as in the
+// Shows a recorded run. Each part of the data is read when a view first needs it; the later parts stand behind this script. Numbers that name things are as in the
 // recording: an index is a place in a table, an id stays with a node or statement through all snapshots.
 (() => {
 
@@ -21,7 +21,6 @@ function toObjects(raw) {
     for (let i = 0; i < count; ++i) object[columns[i]] = row[i];
     return object;
   });
-  if (raw.ssaLists) objects.ssaLists = raw.ssaLists;
   if (raw.marks) objects.marks = new Map(raw.marks);
   return objects;
 }
@@ -89,13 +88,18 @@ function make(tag, attributes, ...children) {
     if (name.startsWith("on")) element.addEventListener(name.slice(2), value);
     else if (value !== null && value !== undefined && value !== false) element.setAttribute(name, value);
   }
-  for (const child of children.flat()) {
+  for (const child of children.flat(Infinity)) {
     if (child !== null && child !== undefined && child !== "") element.append(child);
   }
   return element;
 }
 
 const byId = (id) => document.getElementById(id);
+
+function fill(element, ...children) {
+  element.replaceChildren(...children.flat(Infinity).filter((child) => child !== null && child !== undefined && child !== ""));
+}
+
 const escapeText = (text) => text.replace(/&/g, "&amp;").replace(/</g, "&lt;").replace(/>/g, "&gt;").replace(/"/g, "&quot;");
 const code = (text) => make("code", {}, text);
 const chip = (kind, text) => make("span", { class: "chip " + kind }, text ?? kind);
@@ -153,7 +157,7 @@ function sortedTable({ columns, rows, tools, accepts, hint, label }) {
       if ((!accepts || accepts(row)) && words.every((word) => texts[i].includes(word))) chosen.push(i);
     });
     if (column >= 0) chosen.sort(compare);
-    body.replaceChildren(...chosen.slice(0, limit).map((i) => make("tr", {}, columns.map((each) =>
+    fill(body, ...chosen.slice(0, limit).map((i) => make("tr", {}, columns.map((each) =>
       make("td", { class: each.figure ? "figure" : each.code ? "code" : null }, (each.cell || each.value)(rows[i]))))));
     count.textContent = chosen.length === rows.length ? `${rows.length} rows` : `${chosen.length} of ${rows.length} rows`;
     more.hidden = chosen.length <= limit;
@@ -258,7 +262,7 @@ function inspectLine(line) {
   const ids = [...new Set(states.map((each) => each.id))];
   const remarks = (remarksOnLine().get(line) || []).map((index) => data("remarks")[index]);
   const declared = data("variables").map((each, index) => [each, index]).filter(([each]) => lineOf(each.place) === line && !each.isHidden);
-  byId("inspector").replaceChildren(
+  fill(byId("inspector"),
     make("h2", {}, "Line " + lineTitle(line), byId("view-passes").hidden && ids.length
       ? make("button", { type: "button", style: "float:right;font-weight:400;font-size:12px", onclick: () => { openView("passes"); showLineInPictures(line); } }, "show in the graph") : ""),
     ...declared.map(([each, index]) => make("div", {}, "declares ", variableLink(index, variableName(each)), " ", code(rangeText(each.found)))),
@@ -271,7 +275,7 @@ function inspectLine(line) {
 
 function inspectNode(node) {
   const ids = [...new Set(node.statements.map((index) => data("statements")[index].id))];
-  byId("inspector").replaceChildren(
+  fill(byId("inspector"),
     make("h2", {}, `Node ${node.id}`, node.kind === "block" ? "" : ` (${node.kind})`),
     node.place ? make("div", {}, lineLink(node.place)) : "",
     ...ids.slice(0, 40).map(aboutStatement),
@@ -282,7 +286,7 @@ function inspectNode(node) {
 
 function inspectFolded(indices) {
   const lines = [...new Set(indices.map((index) => lineOf(data("nodes")[index].place)).filter(Boolean))].sort((a, b) => a - b);
-  byId("inspector").replaceChildren(make("h2", {}, `${indices.length} nodes, folded`),
+  fill(byId("inspector"), make("h2", {}, `${indices.length} nodes, folded`),
     make("ul", {}, lines.slice(0, 200).map((line) => make("li", {}, make("button", { type: "button", class: "go", "data-line": line },
       "line " + lineTitle(line)), " ", code((byId("line-" + line)?.lastChild.textContent || "").trim())))));
 }
@@ -349,7 +353,7 @@ function timeText(seconds) {
 function showTimeline() {
   const snapshots = data("snapshots");
   const mostChanges = Math.max(1, ...snapshots.map(totalOf)), mostTime = Math.max(1e-9, ...snapshots.map((each) => each.seconds));
-  byId("timeline").replaceChildren(...snapshots.map((each) => {
+  fill(byId("timeline"), ...snapshots.map((each) => {
     const total = totalOf(each), height = total ? 4 + 30 * Math.sqrt(total / mostChanges) : 0;
     const bars = Object.entries(each.tally).filter(([, count]) => count).map(([kind, count]) =>
       make("span", { class: "bar-" + kind, style: `height:${(height * count / total).toFixed(1)}px` }));
@@ -366,10 +370,11 @@ const findProcedure = (snapshot, name) => snapshot.procedures.find((index) => da
 
 function choosePass(number, line) {
   view.pass = number;
+  changeAt = -1;
   const snapshot = snapshotAfter();
   document.querySelectorAll("#timeline button").forEach((each, i) => each.setAttribute("aria-selected", i === number));
   const tally = Object.entries(snapshot.tally).filter(([, count]) => count);
-  byId("pass-about").replaceChildren(make("b", {}, snapshot.pass), ": " + snapshot.purpose + ". ", tally.map(([kind, count]) => [chip(kind, `${count} ${kind}`), " "]),
+  fill(byId("pass-about"), make("b", {}, snapshot.pass), ": " + snapshot.purpose + ". ", tally.map(([kind, count]) => [chip(kind, `${count} ${kind}`), " "]),
     make("span", { class: "soft" }, `${snapshot.nodeCount} nodes, ${snapshot.statementCount} statements, ${snapshot.conditionCount} conditions afterwards; ${timeText(snapshot.seconds)}`));
   fillProcedures();
   if (line) chooseProcedureOfLine(line);
@@ -385,7 +390,7 @@ function fillProcedures() {
     for (const index of snapshot.procedures) names.set(data("procedures")[index].name, data("procedures")[index].title);
   const listed = [...names].sort((a, b) => (changed.get(b[0]) || 0) - (changed.get(a[0]) || 0));
   const select = byId("procedure");
-  select.replaceChildren(...listed.map(([name, title]) => make("option", { value: name }, title + (changed.get(name) ? ` (${changed.get(name)} changed)` : ""))),
+  fill(select, ...listed.map(([name, title]) => make("option", { value: name }, title + (changed.get(name) ? ` (${changed.get(name)} changed)` : ""))),
     make("option", { value: "*calls" }, "whole program: calls"));
   if (!names.has(view.procedure) && view.procedure !== "*calls") view.procedure = listed[0][0];
   select.value = view.procedure;
@@ -396,7 +401,7 @@ function showPictures() {
   const boxes = [["before", snapshotBefore()], ["after", snapshotAfter()]];
   for (const [side, snapshot] of boxes) {
     const title = snapshot.number ? "after " + snapshot.number + " " + snapshot.pass : "as built";
-    byId("caption-" + side).textContent = (side === "before" ? "before: " : isFirst ? "" : "after: ") + title;
+    byId("caption-" + side).textContent = side === "before" ? `before (${title})` : title;
     byId(side).closest("figure").hidden = isFirst && side === "before";
     view[side] = isFirst && side === "before" ? null : drawSide(byId(side), snapshot, side);
   }
@@ -409,10 +414,10 @@ function drawSide(element, snapshot, side) {
   const index = view.procedure === "*calls" ? -1 : findProcedure(snapshot, view.procedure);
   const picture = view.procedure === "*calls" ? { layout: data("pictures").calls[snapshot.number] } : index < 0 ? null : data("pictures").procedures[index];
   if (!picture || picture.layout < 0) {
-    element.replaceChildren(make("p", {}, whyNoPicture(picture)));
+    fill(element, make("p", {}, whyNoPicture(picture)));
     return null;
   }
-  const layout = data("pictures").layouts[picture.layout];
+  const layout = data("layout-" + picture.layout);
   const scene = { element, layout, rows: new Map(), lines: new Map(), marked: [], x: 0, y: 0, scale: 1, index, side };
   const body = index < 0 ? drawCalls(layout, snapshot) : drawBoxes(scene, layout, picture, snapshot, side);
   element.innerHTML = `<svg role="img" aria-label="graph ${side}"><defs>${["f", "t", "n"].map((kind) =>
@@ -512,7 +517,11 @@ function drawCalls(layout, snapshot) {
 function drawSsa() {
   for (const scene of [view.before, view.after]) {
     if (!scene || scene.index < 0) continue;
-    const procedures = data("procedures"), list = procedures.ssaLists[procedures[scene.index].ssa];
+    if (chosen.node < 0 && !byId("ssa").checked) {
+      scene.element.querySelector(".overlay").replaceChildren();
+      continue;
+    }
+    const list = data("ssa")[data("procedures")[scene.index].ssa];
     let text = "";
     for (let i = 0; i + 1 < list.length; i += 2) {
       const isNear = chosen.node >= 0 && (list[i] === chosen.node || list[i + 1] === chosen.node);
@@ -557,12 +566,11 @@ function bringToSight(scene, at, scale) {
 
 // What fits stays whole; of anything larger the first change is shown, readable.
 function startPosition() {
-  for (const scene of scenes()) {
-    fit(scene);
-    if (scene.scale >= 0.6) continue;
-    const first = scene.marked.length ? scene.rows.get(data("nodes")[scene.marked[0]].id) : null;
+  scenes().forEach(fit);
+  const large = scenes().filter((scene) => scene.scale < 0.6), first = changedNodes()[0];
+  for (const scene of large) {
     const [x, y, width] = scene.layout.boxes[0];
-    bringToSight(scene, first || { x, y, width }, 0.85);
+    bringToSight(scene, (first === undefined ? null : placeNear(scene, data("nodes")[first].id)) || { x, y, width }, 0.85);
   }
   if (chosen.line || chosen.node >= 0) markChosen();
 }
@@ -591,19 +599,40 @@ function pan(scene, x, y) {
 
 let changeAt = -1;
 function nextChange(step) {
-  const scene = scenes().reverse().find((each) => each.marked.length);
-  if (!scene) return;
-  changeAt = (changeAt + step + scene.marked.length) % scene.marked.length;
-  const index = scene.marked[changeAt % scene.marked.length];
+  const nodes = changedNodes();
+  if (!nodes.length) return;
+  changeAt = changeAt < 0 && step < 0 ? nodes.length - 1 : (changeAt + step + nodes.length) % nodes.length;
+  const index = nodes[changeAt];
   chooseNode(index);
   bringBothToSight(data("nodes")[index].id);
 }
 
 function bringBothToSight(id) {
   for (const scene of scenes()) {
-    const at = scene.rows.get(id);
+    const at = placeNear(scene, id);
     if (at) bringToSight(scene, at);
   }
+}
+
+// Marked nodes of both sides, first those that have gone.
+function changedNodes() {
+  const nodes = new Map();
+  for (const scene of scenes())
+    for (const index of scene.marked) if (!nodes.has(data("nodes")[index].id)) nodes.set(data("nodes")[index].id, index);
+  return [...nodes.values()];
+}
+
+// Where a node stands, or on the side that lacks it the nearest one before it.
+function placeNear(scene, id) {
+  if (scene.rows.has(id)) return scene.rows.get(id);
+  const other = scenes().find((each) => each !== scene && each.rows.has(id));
+  if (!other) return null;
+  let near = null;
+  for (const each of other.rows.keys()) {
+    if (each === id && near) return near;
+    near = scene.rows.get(each) || near;
+  }
+  return near;
 }
 
 function listenToPicture(side) {
@@ -700,13 +729,13 @@ function showLineInPictures(line) {
 
 function showChanges() {
   if (view.pass === 0) {
-    byId("changes").replaceChildren();
+    fill(byId("changes"));
     return;
   }
   const text = (index) => index < 0 ? "" : data("statements")[index].text;
   const placeOf = (each) => data("statements")[each.before >= 0 ? each.before : each.after]?.place || 0;
   const title = (name) => name.replace(/^#/, "");
-  byId("changes").replaceChildren(make("h3", {}, "What this pass changed"), sortedTable({
+  fill(byId("changes"), make("h3", {}, "What this pass changed"), sortedTable({
     label: "changes", hint: "filter the changes", rows: data("changes-" + view.pass),
     columns: [
       { title: "change", value: (each) => each.kind, cell: (each) => chip(each.kind) },
@@ -753,7 +782,6 @@ function fillVariables(section) {
       { title: "found", value: (each) => ["constant", "range"].includes(each.found[0]) ? asNumber(each.found[1]) : rangeText(each.found),
         cell: (each) => make("span", { title: each.notTracked || null }, rangeText(each.found), each.unit && ["constant", "range"].includes(each.found[0]) ? make("span", { class: "soft" }, " " + each.unit) : "") },
       { title: "starts as", value: (each) => each.kind === "input" ? NaN : asNumber(each.initial), cell: (each) => each.kind === "input" ? "–" : numberText(each.initial), figure: true },
-      { title: "versions", value: (each) => each.versions.length, figure: true },
       { title: "read", value: (each) => each.uses.length, figure: true },
       { title: "declared", value: (each) => lineOf(each.place), cell: (each) => places([each.place]) },
       { title: "defined in lines", value: (each) => each.definitions.length, cell: (each) => places(each.definitions) },
@@ -792,6 +820,7 @@ function rangeBar(each, verdict) {
   const label = (value, x, anchor) => `<text x="${x}%" y="30" text-anchor="${anchor}">${numberText(value)}</text>`;
   let text = `<svg role="img" aria-label="${escapeText(variableName(each) + " " + rangeText(each.found))}">`;
   text += isEndless ? '<rect class="none" x="1%" y="8" width="98%" height="10"/>' : '<rect class="track" x="1%" y="8" width="98%" height="10" rx="2"/>';
+  if (verdict.kind === "anything" && !isEndless) text += '<rect class="any" x="1%" y="8" width="98%" height="10" rx="2"/>';
   if (isKnown) {
     const kind = verdict.notes.some(([note]) => note === "wide") ? "wide" : verdict.notes.length ? "warn" : "";
     text += `<rect class="found ${kind}" x="${at(verdict.low).toFixed(3)}%" y="8" width="${Math.max(0.4, at(verdict.high) - at(verdict.low)).toFixed(3)}%" height="10" rx="2"/>`;
@@ -802,7 +831,7 @@ function rangeBar(each, verdict) {
 }
 
 function fillRanges(section) {
-  const which = choice("show", [["known", "ranges that were found"], ["warn", "at or near a limit"], ["wide", "types far too wide"], ["constant", "constants"], ["all", "all"]]);
+  const which = choice("show", [["all", "all"], ["known", "ranges that were found"], ["warn", "at or near a limit"], ["wide", "types far too wide"], ["constant", "constants"]]);
   const search = make("input", { type: "search", placeholder: "filter by name or type", "aria-label": "filter by name or type" });
   const count = make("span", { class: "soft" }), plot = make("div", { id: "plot" });
   const list = data("variables").map((each, index) => ({ each, index, verdict: judge(each) })).filter(({ each }) => !each.isHidden);
@@ -811,11 +840,11 @@ function fillRanges(section) {
   function show() {
     const words = search.value.toLowerCase().split(/\s+/).filter(Boolean);
     const shown = list.filter((item) => accepts(item) && words.every((word) => (variableName(item.each) + " " + item.each.type).toLowerCase().includes(word)));
-    plot.replaceChildren(...shown.slice(0, 400).flatMap(({ each, index, verdict }) => {
+    fill(plot, ...shown.slice(0, 400).flatMap(({ each, index, verdict }) => {
       const bar = make("div", {});
       bar.innerHTML = rangeBar(each, verdict);
       return [make("div", {}, variableLink(index), make("div", { class: "soft", style: "font-size:12px" }, each.type + (each.unit ? ", " + each.unit : ""))), bar,
-        make("div", {}, code(rangeText(each.found)), each.unit && verdict.low !== undefined ? make("span", { class: "soft" }, " " + each.unit) : "",
+        make("div", { title: each.notTracked || null }, each.found[0] === "unknown" ? make("span", { class: "soft" }, "not tracked") : code(rangeText(each.found)), each.unit && verdict.low !== undefined ? make("span", { class: "soft" }, " " + each.unit) : "",
           make("div", {}, verdict.notes.map(([kind, text]) => [chip(kind === "wide" ? "info" : "warn", text), " "])))];
     }));
     count.textContent = `${shown.length} of ${list.length} variables` + (shown.length > 400 ? ", the first 400 shown" : "");
@@ -823,7 +852,7 @@ function fillRanges(section) {
   search.addEventListener("input", debounce(show));
   which.addEventListener("change", show);
   section.append(make("div", { class: "tools" }, search, which, count),
-    make("p", { class: "soft" }, "Grey: what the type admits, in physical units. Coloured: what the optimiser found, over all places. A dashed frame: the type has no end."), plot);
+    make("p", { class: "soft" }, "Grey: what the type admits, in physical units. Coloured: what the optimiser found, over all places; pale: anything that the type can hold. A dashed frame: the type has no end."), plot);
   show();
 }
 
@@ -848,7 +877,7 @@ function fillWhy(section) {
     select.select.value = index;
     const each = data("variables")[index];
     const versions = each.versions.slice(0, 100);
-    answer.replaceChildren(make("h2", {}, variableName(each), " ", make("span", { class: "soft", style: "font-weight:400" }, `${each.kind} ${each.type}`), " ", lineLink(each.place)),
+    fill(answer, make("h2", {}, variableName(each), " ", make("span", { class: "soft", style: "font-weight:400" }, `${each.kind} ${each.type}`), " ", lineLink(each.place)),
       make("p", {}, "Altogether: ", code(rangeText(each.found)), each.unit ? " " + each.unit : "", each.notTracked ? `. Never taken for constant: ${each.notTracked}` : "",
         each.keptBecause ? `. Its definitions stay: ${each.keptBecause}` : ""),
       ...versions.flatMap((number) => {
@@ -1012,7 +1041,7 @@ const views = [["passes", "Passes", null], ["variables", "Variables", fillVariab
 const filled = new Set(["passes"]);
 
 function openView(name) {
-  for (const [each, , fill] of views) {
+  for (const [each, , fillView] of views) {
     const section = byId("view-" + each), isOpen = each === name;
     section.hidden = !isOpen;
     const tab = byId("tab-" + each);
@@ -1020,12 +1049,12 @@ function openView(name) {
     tab.tabIndex = isOpen ? 0 : -1;
     if (!isOpen || filled.has(each)) continue;
     filled.add(each);
-    fill(section);
+    fillView(section);
   }
 }
 
 function showTabs() {
-  byId("tabs").append(...views.map(([name, title]) => make("button", { type: "button", role: "tab", id: "tab-" + name, "aria-controls": "view-" + name, onclick: () => openView(name) }, title)));
+  byId("tabs").append(...views.map(([name, title]) => make("button", { type: "button", role: "tab", id: "tab-" + name, "aria-controls": "view-" + name, onclick: () => document.documentElement.dataset.ready && openView(name) }, title)));
   for (const [name] of views) byId("view-" + name).setAttribute("aria-labelledby", "tab-" + name);
   byId("tabs").addEventListener("keydown", (event) => {
     const step = { ArrowRight: 1, ArrowLeft: -1 }[event.key];
@@ -1075,7 +1104,6 @@ function listen() {
 
 function start() {
   showTabs();
-  listen();
   const assumptions = data("about").assumptions;
   if (assumptions.length) {
     byId("assumptions").hidden = false;
@@ -1087,14 +1115,21 @@ function start() {
     byId("timeline").before(make("p", { class: "notice", id: "no-graphviz" }, "Graphviz (the program dot) was not found when this page was written, so it has no pictures of the graphs. Everything else is here."));
   else if (data("pictures").leftOut)
     byId("timeline").before(make("p", { class: "notice", id: "left-out" }, `${data("pictures").leftOut} of ${data("pictures").procedures.length} pictures are left out, those with the fewest changes: the time for them was over.`));
-  showSource();
   const snapshots = data("snapshots");
   const propagation = snapshots.findIndex((each) => each.pass.startsWith("propagate"));
   choosePass(propagation >= 0 ? propagation : snapshots.length - 1);
   byId("inspector").append(make("p", { class: "empty" }, "Choose a line or a node: what it became, which pass did it, and why, stands here."));
-  document.documentElement.dataset.ready = String(Math.round(performance.now()));
+  requestAnimationFrame(() => setTimeout(() => { document.documentElement.dataset.firstPicture = String(Math.round(performance.now())); }));
+}
+
+// The rest of the data stands behind the script: only when it is there can everything be clicked.
+function startRest() {
+  showSource();
+  listen();
+  document.documentElement.dataset.ready = "yes";
   setTimeout(markSource, 50);
 }
 
 start();
+document.addEventListener("DOMContentLoaded", startRest);
 })();
