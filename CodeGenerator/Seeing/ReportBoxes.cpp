@@ -279,6 +279,8 @@ private:
             }
             Kept = std::move(Shown);
         }
+        for (ReportItem& Each : Kept)
+            Each.IsFolded = Each.IsFolded && Each.Nodes.size() > 1;
         Box.Items = std::move(Kept);
     }
 

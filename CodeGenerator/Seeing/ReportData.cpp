@@ -200,7 +200,7 @@ Json layout(const PlacedPicture& Picture) {
         Boxes.push_back({Each.X, Each.Y, Each.Width, Each.Height});
     Json Edges = Json::array();
     for (const PlacedPicture::Edge& Each : Picture.Edges)
-        Edges.push_back(Json::array({std::string(1, Each.What), Each.Path}));
+        Edges.push_back(Json::array({Each.From, Each.To, std::string(1, Each.What), Each.Path}));
     return {{"width", Picture.Width},
             {"height", Picture.Height},
             {"boxes", std::move(Boxes)},

@@ -104,9 +104,14 @@ const escapeText = (text) => text.replace(/&/g, "&amp;").replace(/</g, "&lt;").r
 const code = (text) => make("code", {}, text);
 const chip = (kind, text) => make("span", { class: "chip " + kind }, text ?? kind);
 
-function lineLink(place) {
+function lineLink(place, isShort) {
   if (!place) return "";
-  return make("button", { type: "button", class: "go", "data-line": lineOf(place) }, "line " + lineTitle(lineOf(place)));
+  return make("button", { type: "button", class: "go", "data-line": lineOf(place) }, (isShort ? "" : "line ") + lineTitle(lineOf(place)));
+}
+
+// Texts of the recording quote code in backticks.
+function prose(text) {
+  return make("span", {}, text.split("`").map((piece, i) => i % 2 ? code(piece) : piece));
 }
 
 function variableLink(index, text) {
@@ -268,7 +273,7 @@ function inspectLine(line) {
     ...declared.map(([each, index]) => make("div", {}, "declares ", variableLink(index, variableName(each)), " ", code(rangeText(each.found)))),
     ...ids.map(aboutStatement),
     remarks.length ? make("h3", {}, "Remarks") : "",
-    make("ul", {}, remarks.map((each) => make("li", {}, each.text, " ", make("span", { class: "soft" }, each.pass)))),
+    make("ul", {}, remarks.map((each) => make("li", {}, prose(each.text), " ", make("span", { class: "soft" }, each.pass)))),
     ids.length || declared.length || remarks.length ? "" : make("p", { class: "empty" }, "Nothing of the graph begins on this line."));
   byId("inspector").scrollTop = 0;
 }
@@ -300,7 +305,7 @@ function aboutStatement(id) {
   for (const index of fatesOfStatement().get(id) || []) {
     const fate = data("fates")[index];
     lines.push(make("div", {}, fate.isRemoved ? chip("removed") : chip(fate.looksUnused ? "warn" : "good", "stays"), " ",
-      fate.isRemoved ? ["by ", passLink(fate.snapshot), ": "] : "", fate.why + " ", fate.because ? lineLink(fate.because) : ""));
+      fate.isRemoved ? ["by ", passLink(fate.snapshot), ": "] : "", prose(fate.why), " ", fate.because ? lineLink(fate.because) : ""));
   }
   for (const index of saturationsOfStatement().get(id) || []) lines.push(saturationText(data("saturations")[index]));
   for (const index of (versionsOfStatement().get(id) || []).slice(0, 6)) {
@@ -330,7 +335,7 @@ function explanation(index) {
     ++count;
     const goesOn = next >= 0 && !told.has(next);
     tree.append(make("div", { style: `padding-left:${Math.min(depth, 14) * 14}px`, class: goesOn || next >= 0 ? null : "leaf" },
-      text + " ", lineLink(place)));
+      prose(text), " ", lineLink(place)));
     if (!goesOn) continue;
     told.add(next);
     const further = data("versions")[next].explanation;
@@ -375,7 +380,7 @@ function choosePass(number, line) {
   document.querySelectorAll("#timeline button").forEach((each, i) => each.setAttribute("aria-selected", i === number));
   const tally = Object.entries(snapshot.tally).filter(([, count]) => count);
   fill(byId("pass-about"), make("b", {}, snapshot.pass), ": " + snapshot.purpose + ". ", tally.map(([kind, count]) => [chip(kind, `${count} ${kind}`), " "]),
-    make("span", { class: "soft" }, `${snapshot.nodeCount} nodes, ${snapshot.statementCount} statements, ${snapshot.conditionCount} conditions afterwards; ${timeText(snapshot.seconds)}`));
+    make("span", { class: "soft" }, `${snapshot.nodeCount} nodes, ${snapshot.statementCount} statements after it`));
   fillProcedures();
   if (line) chooseProcedureOfLine(line);
   showPictures();
@@ -418,11 +423,11 @@ function drawSide(element, snapshot, side) {
     return null;
   }
   const layout = data("layout-" + picture.layout);
-  const scene = { element, layout, rows: new Map(), lines: new Map(), marked: [], x: 0, y: 0, scale: 1, index, side };
+  const scene = { element, layout, rows: new Map(), lines: new Map(), marked: [], boxes: [], x: 0, y: 0, scale: 1, index, side };
   const body = index < 0 ? drawCalls(layout, snapshot) : drawBoxes(scene, layout, picture, snapshot, side);
   element.innerHTML = `<svg role="img" aria-label="graph ${side}"><defs>${["f", "t", "n"].map((kind) =>
     `<marker id="tip-${side}-${kind}" viewBox="0 0 10 10" refX="0" refY="5" markerWidth="7" markerHeight="7" markerUnits="userSpaceOnUse" orient="auto"><path class="tip ${kind}" d="M0,1L10,5L0,9z"/></marker>`).join("")}</defs><g class="world">` +
-    layout.edges.map(([kind, path]) => `<path class="way ${kind}" d="${path}" marker-end="url(#tip-${side}-${kind})"/>`).join("") + body + '<g class="overlay"></g></g></svg>';
+    layout.edges.map(([, , kind, path]) => `<path class="way ${kind}" d="${path}" marker-end="url(#tip-${side}-${kind})"/>`).join("") + body + '<g class="overlay"></g></g></svg>';
   if (picture.isFolded) byId("caption-" + side).textContent += " (over 1,000 nodes: folded)";
   return scene;
 }
@@ -462,6 +467,7 @@ function drawBoxes(scene, layout, picture, snapshot, side) {
   layout.boxes.forEach(([x, y, width, height], boxIndex) => {
     pieces.push(`<rect class="box" x="${x}" y="${y}" width="${width}" height="${height}" rx="3"/>`);
     let top = y + 4;
+    const ids = scene.boxes[boxIndex] = [];
     picture.boxes[boxIndex].forEach((item, i) => {
       if (i) pieces.push(`<line class="rule" x1="${x}" x2="${x + width}" y1="${top}" y2="${top}"/>`);
       const rows = Array.isArray(item) ? [{ text: `⋯ ${item.length} nodes`, isVirtual: true }] : rowsOf(nodes[item]);
@@ -474,6 +480,7 @@ function drawBoxes(scene, layout, picture, snapshot, side) {
         const mark = marks.get(nodes[item].id) || "";
         pieces.push(`<g class="row ${mark}" data-node="${item}" data-id="${nodes[item].id}">`);
         scene.rows.set(nodes[item].id, at);
+        ids.push(nodes[item].id);
         noteLines(scene, nodes[item], at);
         if (mark) scene.marked.push(item);
       }
@@ -567,7 +574,7 @@ function bringToSight(scene, at, scale) {
 // What fits stays whole; of anything larger the first change is shown, readable.
 function startPosition() {
   scenes().forEach(fit);
-  const large = scenes().filter((scene) => scene.scale < 0.6), first = changedNodes()[0];
+  const large = scenes().filter((scene) => scene.index >= 0 && scene.scale < 0.6), first = changedNodes()[0];
   for (const scene of large) {
     const [x, y, width] = scene.layout.boxes[0];
     bringToSight(scene, (first === undefined ? null : placeNear(scene, data("nodes")[first].id)) || { x, y, width }, 0.85);
@@ -622,17 +629,26 @@ function changedNodes() {
   return [...nodes.values()];
 }
 
-// Where a node stands, or on the side that lacks it the nearest one before it.
+// Where a node stands, or on the side that lacks it the nearest one on the way to it.
 function placeNear(scene, id) {
   if (scene.rows.has(id)) return scene.rows.get(id);
   const other = scenes().find((each) => each !== scene && each.rows.has(id));
   if (!other) return null;
-  let near = null;
-  for (const each of other.rows.keys()) {
-    if (each === id && near) return near;
-    near = scene.rows.get(each) || near;
+  const first = other.boxes.findIndex((ids) => ids.includes(id)), seen = new Set([first]), pending = [first];
+  const common = (ids) => scene.rows.get(ids.filter((each) => scene.rows.has(each)).pop());
+  const before = common(other.boxes[first].slice(0, other.boxes[first].indexOf(id)));
+  if (before) return before;
+  while (pending.length) {
+    const box = pending.shift();
+    for (const [from, to] of other.layout.edges) {
+      if (to !== box || seen.has(from)) continue;
+      const found = common(other.boxes[from]);
+      if (found) return found;
+      seen.add(from);
+      pending.push(from);
+    }
   }
-  return near;
+  return null;
 }
 
 function listenToPicture(side) {
@@ -739,11 +755,11 @@ function showChanges() {
     label: "changes", hint: "filter the changes", rows: data("changes-" + view.pass),
     columns: [
       { title: "change", value: (each) => each.kind, cell: (each) => chip(each.kind) },
-      { title: "line", value: (each) => lineOf(placeOf(each)), cell: (each) => lineLink(placeOf(each)) },
+      { title: "line", value: (each) => lineOf(placeOf(each)), cell: (each) => lineLink(placeOf(each), true) },
       { title: "procedure", value: (each) => title(each.procedure) },
       { title: "before", value: (each) => text(each.before), code: true },
       { title: "after", value: (each) => text(each.after), code: true },
-      { title: "why", value: (each) => each.why }
+      { title: "why", value: (each) => each.why, cell: (each) => prose(each.why) }
     ] }));
 }
 
@@ -905,11 +921,11 @@ function fillSaturation(section) {
     label: "saturations", hint: "filter by statement or variable", rows: data("saturations"), tools: [answers],
     accepts: (each) => { const wanted = answers.select.value; return !wanted || (wanted === "never" ? each.low === wanted && each.high === wanted : each.low === wanted || each.high === wanted); },
     columns: [
-      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place) },
+      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place, true) },
       { title: "variable", value: (each) => variableName(data("variables")[each.variable]), cell: (each) => variableLink(each.variable) },
       { title: "statement", value: (each) => data("statements")[each.statement]?.text ?? "", code: true },
       { title: "limits", value: (each) => limitsText(data("variables")[each.variable]).replace(/ saturates$/, "") },
-      { title: "brings", value: (each) => rangeText(each.value) },
+      { title: "brings", value: (each) => rangeText(each.value), cell: (each) => make("span", { class: "whole" }, rangeText(each.value)) },
       { title: "at the lower limit", value: (each) => each.low, cell: (each) => cell(each.low) },
       { title: "at the upper limit", value: (each) => each.high, cell: (each) => cell(each.high) }
     ] }));
@@ -921,12 +937,12 @@ function fillStatements(section) {
     label: "statements", hint: "filter by text, pass or reason", rows: data("fates"), tools: [which],
     accepts: (each) => ({ removed: each.isRemoved, kept: !each.isRemoved, unused: each.looksUnused })[which.select.value] ?? true,
     columns: [
-      { title: "line", value: (each) => lineOf(data("statements")[each.statement].place), cell: (each) => lineLink(data("statements")[each.statement].place) },
+      { title: "line", value: (each) => lineOf(data("statements")[each.statement].place), cell: (each) => lineLink(data("statements")[each.statement].place, true) },
       { title: "statement", value: (each) => data("statements")[each.statement].text, code: true },
       { title: "fate", value: (each) => each.isRemoved ? "removed" : each.looksUnused ? "stays, looks unused" : "stays",
         cell: (each) => each.isRemoved ? chip("removed") : chip(each.looksUnused ? "warn" : "good", each.looksUnused ? "stays, looks unused" : "stays") },
       { title: "pass", value: (each) => each.isRemoved ? data("snapshots")[each.snapshot].pass : "", cell: (each) => each.isRemoved ? passLink(each.snapshot) : "" },
-      { title: "why", value: (each) => each.why },
+      { title: "why", value: (each) => each.why, cell: (each) => prose(each.why) },
       { title: "see", value: (each) => lineOf(each.because), cell: (each) => lineLink(each.because) }
     ] }));
 }
@@ -936,9 +952,9 @@ function fillRemarks(section) {
   section.append(sortedTable({
     label: "remarks", hint: "filter the remarks", rows: data("remarks"), tools: [kind], accepts: (each) => !kind.select.value || each.kind === kind.select.value,
     columns: [
-      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place) },
+      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place, true) },
       { title: "kind", value: (each) => each.kind, cell: (each) => chip(each.kind, { passed: "done", missed: "not done", analysis: "found out" }[each.kind]) },
-      { title: "remark", value: (each) => each.text },
+      { title: "remark", value: (each) => each.text, cell: (each) => prose(each.text) },
       { title: "pass", value: (each) => each.pass }
     ] }));
 }
