@@ -801,7 +801,7 @@ function fillVariables(section) {
       { title: "read", value: (each) => each.uses.length, figure: true },
       { title: "declared", value: (each) => lineOf(each.place), cell: (each) => places([each.place]) },
       { title: "defined in lines", value: (each) => each.definitions.length, cell: (each) => places(each.definitions) },
-      { title: "kept, or not tracked, because", value: (each) => [each.notTracked && "not tracked: " + each.notTracked, each.keptBecause].filter(Boolean).join("; ") }
+      { title: "kept / not tracked", value: (each) => [each.notTracked && "not tracked: " + each.notTracked, each.keptBecause].filter(Boolean).join("; ") }
     ] }));
 }
 
