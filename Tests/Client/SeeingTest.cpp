@@ -199,7 +199,8 @@ void checkRecording(const Recording& Of) {
                 << Of.Statements[static_cast<std::size_t>(Each.Before)].Text;
         }
         std::map<unsigned, std::string> Standing;
-        for (const Layout::Entry& Entry : Layout(Of, Now).getEntries()) {
+        const Layout Where(Of, Now);
+        for (const Layout::Entry& Entry : Where.getEntries()) {
             const RecordedStatement& Each = Of.Statements[static_cast<std::size_t>(Entry.State)];
             Standing[Each.Id] = Each.Text;
         }
@@ -210,7 +211,7 @@ void checkRecording(const Recording& Of) {
 }
 
 TEST(Seeing, RecordingsOfRandomProgramsHoldTogether) {
-    for (std::uint32_t Seed = 1; Seed <= 60; ++Seed) {
+    for (std::uint32_t Seed = 1; Seed <= 20; ++Seed) {
         const std::string Text = fuzz::RandomProgram(Seed).text();
         const SeenRun Seen(Text);
         const SeenRun Unseen(Text, nullptr, false);
@@ -228,12 +229,14 @@ TEST(Seeing, RecordingsOfRandomProgramsHoldTogether) {
 TEST(Seeing, TheLimitIsMetByEveryNumberOfChanges) {
     for (const char* Name : Examples) {
         const std::string Text = exampleText(Name);
-        RewriteLimiter All(1000000);
-        const SeenRun Free(Text, &All, false);
-        EXPECT_EQ(Free.Code, SeenRun(Text, nullptr, false).Code);
-        const std::size_t Count = All.getBudget().getCount();
+        const SeenRun Free(Text, nullptr, false);
+        std::size_t Count = 0;
+        {
+            RewriteLimiter All(1000000);
+            EXPECT_EQ(SeenRun(Text, &All, false).Code, Free.Code);
+            Count = All.getBudget().getCount();
+        }
         ASSERT_GT(Count, 50U);
-        std::string Former;
         for (std::size_t Limit = 0; Limit <= Count; Limit += 1 + Limit / 8) {
             RewriteLimiter Some(Limit);
             const SeenRun Limited(Text, &Some, true);

@@ -12,7 +12,8 @@ namespace {
 
 // The pass that follows another one on the default road; null after the last.
 const Pass* passAfter(std::string_view Name) {
-    const std::vector<PassId>& Ids = PassSequence::defaultOrder().getPasses();
+    const PassSequence Order = PassSequence::defaultOrder();
+    const std::vector<PassId>& Ids = Order.getPasses();
     if (Name.empty())
         return &passOf(Ids.front());
     for (std::size_t i = 0; i + 1 < Ids.size(); ++i)
