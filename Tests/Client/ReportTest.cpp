@@ -84,11 +84,11 @@ TEST(Report, PageIsWellFormedAndNeedsNothingBesideItself) {
         EXPECT_EQ(Parts.count("layout-0"), *Before == '\0' ? 1u : 0u);
         // Every picture has a place for each of its boxes.
         for (const nlohmann::json& Each : Parts["pictures"]["procedures"]) {
-            if (*Before != '\0')
-                EXPECT_EQ(Each["layout"], -1);
-            else
+            ASSERT_EQ(Each["layout"] == -1, *Before != '\0');
+            if (*Before == '\0') {
                 EXPECT_EQ(Each["boxes"].size(),
                           Parts["layout-" + Each["layout"].dump()]["boxes"].size());
+            }
         }
     }
 }
@@ -121,8 +121,8 @@ void checkBoxes(const Recording& Of, const RecordedProcedure& Procedure, const R
     }
     for (const std::pair<int, int>& Each : Ways)
         ASSERT_TRUE(Each.first == Each.second || Wanted.count(Each) != 0);
-    if (AreEdgesKept)
-        EXPECT_GE(Made.Edges.size(), Wanted.size());
+    // Parallel ways of a branch stay two.
+    EXPECT_TRUE(!AreEdgesKept || Made.Edges.size() >= Wanted.size());
 }
 
 TEST(Report, FoldingKeepsEachNodeAndEachWay) {
@@ -165,7 +165,8 @@ TEST(Report, PlacesOfABrokenLayoutAreRefused) {
     EXPECT_EQ(Placed.Edges[0].What, 't');
     EXPECT_EQ(Placed.Edges[0].Path, "M72,72C72,108");
     EXPECT_FALSE(readPlain(Whole, 0, Placed)); // a box that nobody ordered
-    for (const std::size_t Length : {0u, 30u, 80u, 100u})
+    for (const std::size_t Length :
+         {std::size_t{0}, std::size_t{30}, std::size_t{80}, Whole.size() - 5})
         EXPECT_FALSE(readPlain(Whole.substr(0, Length), 1, Placed)) << Length;
 }
 

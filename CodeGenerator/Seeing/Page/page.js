@@ -324,22 +324,26 @@ function saturationText(each) {
   return make("div", {}, "saturates ", sides, make("span", { class: "soft" }, "(brings " + rangeText(each.value) + ")"));
 }
 
-// Follows the explanation of a version through the versions it names, each one once.
+// Follows the explanation of a version through the versions it names, each one once: a line that names a version gives way to
+// what that one says of itself.
 function explanation(index) {
-  const tree = make("div", { class: "tree" });
-  const told = new Set([index]);
-  const pending = data("versions")[index].explanation.map((reason) => [reason, 0]).reverse();
+  const tree = make("div", { class: "tree" }), told = new Set(), pending = [];
+  const tell = (version, depth) => {
+    told.add(version);
+    const reasons = data("versions")[version].explanation;
+    for (let i = reasons.length - 1; i >= 0; --i) pending.push([reasons[i], i ? depth + 1 : depth]);
+  };
+  tell(index, 0);
   let count = 0;
   while (pending.length && count < 200) {
     const [[text, place, next], depth] = pending.pop();
+    if (next >= 0 && !told.has(next)) {
+      tell(next, depth);
+      continue;
+    }
     ++count;
-    const goesOn = next >= 0 && !told.has(next);
-    tree.append(make("div", { style: `padding-left:${Math.min(depth, 14) * 14}px`, class: goesOn || next >= 0 ? null : "leaf" },
-      prose(text), " ", lineLink(place)));
-    if (!goesOn) continue;
-    told.add(next);
-    const further = data("versions")[next].explanation;
-    for (let i = further.length - 1; i >= 0; --i) pending.push([further[i], depth + 1]);
+    tree.append(make("div", { style: `padding-left:${Math.min(depth, 14) * 14}px` },
+      prose(text), next >= 0 ? make("span", { class: "soft" }, " (see above)") : "", " ", lineLink(place)));
   }
   if (pending.length) tree.append(make("div", { class: "soft" }, "… the chain goes on"));
   return tree;
@@ -1055,6 +1059,7 @@ function fillCode(section) {
 const views = [["passes", "Passes", null], ["variables", "Variables", fillVariables], ["ranges", "Ranges", fillRanges], ["why", "Why", fillWhy],
   ["saturation", "Saturation", fillSaturation], ["statements", "Statements", fillStatements], ["remarks", "Remarks", fillRemarks], ["code", "C code", fillCode]];
 const filled = new Set(["passes"]);
+let shown = "passes";
 
 function openView(name) {
   for (const [each, , fillView] of views) {
@@ -1063,10 +1068,12 @@ function openView(name) {
     const tab = byId("tab-" + each);
     tab.setAttribute("aria-selected", isOpen);
     tab.tabIndex = isOpen ? 0 : -1;
+    if (isOpen && shown !== name) byId("views").scrollTop = 0;
     if (!isOpen || filled.has(each)) continue;
     filled.add(each);
     fillView(section);
   }
+  shown = name;
 }
 
 function showTabs() {
