@@ -232,7 +232,7 @@ function markSource() {
 
 // ---- what is chosen --------------------------------------------------------------------------------------------------
 
-const chosen = { line: 0, node: -1 };
+const chosen = { line: 0, node: -1, ids: new Set() };
 
 function chooseLine(line, isFromPicture) {
   chosen.line = line;
@@ -528,14 +528,14 @@ function drawCalls(layout, snapshot) {
 function drawSsa() {
   for (const scene of [view.before, view.after]) {
     if (!scene || scene.index < 0) continue;
-    if (chosen.node < 0 && !byId("ssa").checked) {
+    if (!chosen.ids.size && !byId("ssa").checked) {
       scene.element.querySelector(".overlay").replaceChildren();
       continue;
     }
     const list = data("ssa")[data("procedures")[scene.index].ssa];
     let text = "";
     for (let i = 0; i + 1 < list.length; i += 2) {
-      const isNear = chosen.node >= 0 && (list[i] === chosen.node || list[i + 1] === chosen.node);
+      const isNear = chosen.ids.has(list[i]) || chosen.ids.has(list[i + 1]);
       if (!isNear && !byId("ssa").checked) continue;
       const from = scene.rows.get(list[i]), to = scene.rows.get(list[i + 1]);
       if (from && to) text += `<path class="ssa${isNear ? " near" : ""}" d="${ssaPath(from, to)}" marker-end="url(#tip-${scene.side}-f)"/>`;
@@ -706,9 +706,13 @@ function keyInPicture(event, side) {
 
 function markChosen() {
   document.querySelectorAll(".picture .chosen").forEach((each) => each.classList.remove("chosen"));
+  chosen.ids.clear();
   for (const scene of scenes()) {
     const ids = chosen.node >= 0 ? [chosen.node] : (scene.lines.get(chosen.line) || []).map((each) => each.id);
-    for (const id of ids) scene.element.querySelector(`[data-id="${id}"]`)?.classList.add("chosen");
+    for (const id of ids) {
+      chosen.ids.add(id);
+      scene.element.querySelector(`[data-id="${id}"]`)?.classList.add("chosen");
+    }
   }
   drawSsa();
 }
