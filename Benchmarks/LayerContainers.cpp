@@ -5,6 +5,7 @@
 #include "LEDA/leda.h"
 
 #include <algorithm>
+#include <limits>
 #include <memory>
 #include <vector>
 
@@ -24,6 +25,22 @@ int compare(Thing* const& pLeft, Thing* const& pRight) {
         return pLeft == nullptr ? -1 : 1;
     return (pLeft->number > pRight->number) - (pLeft->number < pRight->number);
 }
+
+} // namespace
+
+namespace leda {
+
+template <>
+struct order_number<Thing*> {
+    static constexpr bool known = true;
+    static std::int64_t of(Thing* const& pThing) {
+        return pThing != nullptr ? pThing->number : std::numeric_limits<std::int64_t>::min();
+    }
+};
+
+} // namespace leda
+
+namespace {
 
 using Set = leda::set<Thing*, leda::avl_tree>;
 
@@ -48,21 +65,23 @@ enum Relation { disjoint, half, subset, behind };
 class SetPairs {
 public:
     SetPairs(Relation relation, int n) : m_things(16 * n + 4096) {
-        for (int i = 0; i < 512; ++i) {
+        for (unsigned int i = 0; i < pairs; ++i) {
             const std::vector<int> Numbers = choose(2 * n);
             Set A, B;
             for (int j = 0; j < n; ++j) {
-                A.insert(
-                    at(relation == behind ? Numbers[std::size_t(j)] % (4 * n) + base() : Numbers[std::size_t(j)] + base()));
+                A.insert(at(relation == behind ? Numbers[std::size_t(j)] % (4 * n) + base()
+                                               : Numbers[std::size_t(j)] + base()));
                 B.insert(at(other(relation, Numbers, n, j) + base()));
             }
             m_pairs.push_back({A, B});
             m_base = m_random.below(4096 - 8);
         }
     }
-    const std::pair<Set, Set>& next() { return m_pairs[m_next++ & 511]; }
+    const std::pair<Set, Set>& next() { return m_pairs[m_next++ % pairs]; }
 
 private:
+    static constexpr unsigned int pairs = 2048;
+
     Thing* at(int i) { return m_things.at(i); }
     int base() const { return m_base; }
     static int other(Relation relation, const std::vector<int>& Numbers, int n, int j) {
@@ -123,20 +142,23 @@ void intersect(benchmark::State& State) {
     }
 }
 
-// Inserts n elements, in random order or in ascending one, and walks them.
+// Inserts n elements, in random orders or in ascending one, and walks them.
 void insertAndWalk(benchmark::State& State) {
     const int n = int(State.range(0));
     Things All(n);
     RandomNumbers Random;
-    std::vector<Thing*> Order;
-    for (int i = 0; i < n; ++i)
-        Order.push_back(All.at(i));
-    if (State.range(1))
-        for (int i = n - 1; i > 0; --i)
-            std::swap(Order[std::size_t(i)], Order[std::size_t(Random.below(i + 1))]);
+    std::vector<std::vector<Thing*>> Orders(std::size_t(1 + 30000 / n));
+    for (std::vector<Thing*>& Order : Orders) {
+        for (int i = 0; i < n; ++i)
+            Order.push_back(All.at(i));
+        if (State.range(1))
+            for (int i = n - 1; i > 0; --i)
+                std::swap(Order[std::size_t(i)], Order[std::size_t(Random.below(i + 1))]);
+    }
+    std::size_t next = 0;
     for (auto _ : State) {
         Set S;
-        for (Thing* pThing : Order)
+        for (Thing* pThing : Orders[next++ % Orders.size()])
             S.insert(pThing);
         long sum = 0;
         for (Thing* pThing : S)

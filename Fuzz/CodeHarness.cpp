@@ -2,6 +2,8 @@
 
 #include "PassTrial.h"
 
+#include "Oracles/HostShell.h"
+
 #include "Emitter/CLiterals.h"
 #include "Model/Conversion.h"
 
@@ -220,14 +222,9 @@ std::string CodeBatch::run(const std::string& Directory, const std::string& Runt
     std::ofstream(Directory + "/batch.c", std::ios::binary) << Source;
     const std::string Command = "cd '" + Directory + "' && gcc -std=c99 -O1 -Wall -Wextra -Werror -I'" +
                                 RuntimeDirectory +
-                                "' batch.c -o batch >messages 2>&1 && timeout 20 ./batch";
-    std::string Output;
-    std::FILE* pPipe = ::popen(Command.c_str(), "r");
-    char Buffer[4096];
-    while (const std::size_t Count =
-               pPipe != nullptr ? std::fread(Buffer, 1, sizeof Buffer, pPipe) : 0)
-        Output.append(Buffer, Count);
-    const int Status = pPipe != nullptr ? ::pclose(pPipe) : -1;
+                                "' batch.c -o batch >messages 2>&1 && timeout 120 ./batch";
+    int Status = 0;
+    const std::string Output = hostshell::run(Command, Status);
     std::string Difference = checkOutput(Output);
     if (Difference.empty() && Status != 0)
         Difference =

@@ -9,12 +9,15 @@
 #include <csignal>
 #include <cstdio>
 #include <cstring>
+#include <ctime>
 #include <filesystem>
 #include <fstream>
+#ifndef _WIN32
 #include <sys/mman.h>
 #include <sys/prctl.h>
 #include <sys/wait.h>
 #include <unistd.h>
+#endif
 
 // Processes: the parent watches, a child works. They share one page: the seed in hand, a counter
 // that shows life, the totals, and the failure that the child has stopped at. So nothing that a
@@ -23,12 +26,14 @@
 
 namespace hpn::fuzz {
 
+#ifndef _WIN32
 namespace {
 
 using Clock = std::chrono::steady_clock;
 
 constexpr unsigned BatchSize = 8;
 constexpr unsigned MostAttempts = 6000;
+constexpr double SleepSeconds = 600.0; // for a process that does nothing
 constexpr double PatienceSeconds = 20.0;
 constexpr double AnswerSeconds = 5.0;
 constexpr double HangSeconds =
@@ -80,6 +85,8 @@ void addCounts(TrialCounts& To, const TrialCounts& From) {
     To.DeadNodes += From.DeadNodes;
     To.Statements += From.Statements;
     To.Exhausted += From.Exhausted;
+    for (std::size_t i = 0; i < PairKindCount; ++i)
+        To.Pairs[i] += From.Pairs[i];
 }
 
 /// How a process ended that did not end by itself, as a kind of failure.
@@ -88,6 +95,16 @@ std::string describeEnd(int Status, bool IsStuck) {
         return Hang;
     return WIFSIGNALED(Status) ? std::string("crash: ") + ::strsignal(WTERMSIG(Status))
                                : "crash: exit status";
+}
+
+/// How long a process has held a core: unlike the time on the wall it says whether it hangs,
+/// however busy the machine is.
+double coreSeconds(pid_t Process) {
+    clockid_t Id;
+    timespec Time{};
+    if (::clock_getcpuclockid(Process, &Id) != 0 || ::clock_gettime(Id, &Time) != 0)
+        return 0.0;
+    return static_cast<double>(Time.tv_sec) + static_cast<double>(Time.tv_nsec) * 1e-9;
 }
 
 class Fuzzer {
@@ -155,14 +172,17 @@ private:
     int watch(pid_t Child, bool& IsStuck) {
         std::uint64_t Life = m_Shared->Life;
         Clock::time_point Seen = Clock::now();
+        double Held = coreSeconds(Child);
         int Status = 0;
         while (::waitpid(Child, &Status, WNOHANG) == 0) {
             ::usleep(20000);
             if (m_Shared->Life != Life) {
                 Life = m_Shared->Life;
                 Seen = Clock::now();
+                Held = coreSeconds(Child);
             }
-            if (seconds(Seen) < PatienceSeconds)
+            // A process that waits for the C compiler holds no core.
+            if (coreSeconds(Child) - Held < PatienceSeconds && seconds(Seen) < SleepSeconds)
                 continue;
             IsStuck = true;
             ::kill(Child, SIGKILL);
@@ -234,7 +254,7 @@ private:
         bool IsStuck = false;
         while (::waitpid(Child, &Status, WNOHANG) == 0) {
             ::usleep(200);
-            if (seconds(Asking) < Patience || IsStuck)
+            if ((coreSeconds(Child) < Patience && seconds(Asking) < SleepSeconds) || IsStuck)
                 continue;
             IsStuck = true;
             ::kill(Child, SIGKILL);
@@ -310,6 +330,11 @@ private:
 
 } // namespace
 
+FuzzTotals runFuzz(const FuzzOptions& Options) {
+    return Fuzzer(Options).run();
+}
+#endif
+
 Trial makeTrial(std::uint64_t Seed, const FuzzOptions& Options) {
     Trial Result;
     Result.Text = Seed % 16 == 15 ? RandomProgram(static_cast<unsigned>(Seed)).text()
@@ -319,11 +344,9 @@ Trial makeTrial(std::uint64_t Seed, const FuzzOptions& Options) {
     Result.ShowsInternals =
         Options.ChecksEvery != 0 && mixBits(14, Seed) % Options.ChecksEvery == 0;
     Result.WantsCode = Options.GccEvery != 0 && mixBits(15, Seed) % Options.GccEvery == 0;
+    if (Options.PairsEvery != 0 && mixBits(16, Seed) % Options.PairsEvery == 0)
+        Result.Pair = static_cast<PairKind>(1 + mixBits(17, Seed) % (PairKindCount - 1));
     return Result;
-}
-
-FuzzTotals runFuzz(const FuzzOptions& Options) {
-    return Fuzzer(Options).run();
 }
 
 std::string describeTotals(const FuzzTotals& Totals) {
@@ -338,6 +361,9 @@ std::string describeTotals(const FuzzTotals& Totals) {
     Text += "constants found " + number(Totals.Counts.Constants) +
             ", nodes removed by propagation " + number(Totals.Counts.DeadNodes) + "\n";
     Text += "pairs of C variants compared " + number(Totals.Compiled) + "\n";
+    for (std::size_t i = 1; i < PairKindCount; ++i)
+        Text += std::string("other program ") + nameOfPair(static_cast<PairKind>(i)) + " " +
+                number(Totals.Counts.Pairs[i]) + "\n";
     for (std::size_t i = 0; i < PassCount; ++i)
         Text += std::string("pass ") + passTable()[i].Name + " " + number(Totals.Counts.Passes[i]) +
                 "\n";

@@ -16,6 +16,7 @@ struct FuzzOptions {
     unsigned GccEvery = 100; ///< one program in so many goes through the C compiler; 0: none
     unsigned ChecksEvery =
         4; ///< the library's own assertions are on for one program in so many; 0: never
+    unsigned PairsEvery = 6; ///< one program in so many is compared with a changed one; 0: none
     unsigned MostFailures = 10;
     std::string Directory = "fuzz-failures";
     std::string RuntimeDirectory; ///< holds hpn_runtime.h

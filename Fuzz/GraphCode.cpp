@@ -378,8 +378,11 @@ private:
     }
     std::int32_t definedVersion(ZfCCfgVariable* pVariable) {
         const std::int32_t Number = versionOf(pVariable);
-        if (Number != None && m_Options.ChecksClaims)
-            m_Result.Versions[static_cast<std::size_t>(Number)].Claimed = claimOf(pVariable);
+        if (Number == None || !m_Options.ChecksClaims)
+            return Number;
+        Version& Defined = m_Result.Versions[static_cast<std::size_t>(Number)];
+        Defined.Claimed = claimOf(pVariable);
+        Defined.IsUndetermined = pVariable->getValue().isUndetermined();
         return Number;
     }
     static Claim claimOf(ZfCCfgVariable* pVariable) {

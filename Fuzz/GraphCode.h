@@ -72,6 +72,7 @@ struct Version {
     std::int32_t Slot = None;
     unsigned Serial = 0; ///< number in the dumps
     Claim Claimed;
+    bool IsUndetermined = false; ///< propagation has concluded nothing
 };
 
 enum class ActionOp : std::uint8_t {

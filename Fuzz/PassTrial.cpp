@@ -1,6 +1,7 @@
 #include "PassTrial.h"
 
 #include "CodeHarness.h"
+#include "Metamorph.h"
 
 #include "Emitter/CEmitter.h"
 #include "LEDA/error.h"
@@ -8,6 +9,7 @@
 #include "Language/Reader.h"
 #include "Language/SourceFiles.h"
 #include "Model/PendingWarnings.h"
+#include "Oracles/GraphShape.h"
 #include "Oracles/SSAVerifier.h"
 #include "Road/PassRunner.h"
 #include "Road/Statistics.h"
@@ -16,7 +18,6 @@
 
 #include <algorithm>
 #include <cctype>
-#include <sstream>
 
 namespace hpn::fuzz {
 
@@ -75,14 +76,6 @@ private:
 std::string Listener::s_Kind;
 std::string Listener::s_First;
 
-bool hasLostExit(ZfCControlFlowGraph& Graph) {
-    for (leda::node v = Graph.first_node(); v != nullptr; v = Graph.next_node(v)) {
-        if (Graph.inf(v)->isExitNode() != nullptr && Graph.indeg(v) == 0)
-            return true;
-    }
-    return false;
-}
-
 // The message without its numbers: faults that differ in them alone are the same.
 std::string withoutNumbers(const std::string& Text) {
     std::string Result;
@@ -105,21 +98,6 @@ std::string kindOfFault(const std::string& Text) {
     return withoutNumbers(Text.substr(0, Second));
 }
 
-// Where propagation has found that a procedure is never left, the values that it would give back
-// have lost their definitions, and the code behind its calls stands although nothing gets there:
-// the library takes every call for one that returns.
-std::string violationsOf(ZfCControlFlowGraph& Graph) {
-    std::string Violations = passes::verifySSA(Graph);
-    if (Violations.empty() || !hasLostExit(Graph))
-        return Violations;
-    std::string Kept;
-    std::istringstream Stream(Violations);
-    for (std::string Line; std::getline(Stream, Line);)
-        Kept +=
-            Line.find("a returned value has no definition") == std::string::npos ? Line + "\n" : "";
-    return Kept;
-}
-
 // Looks at the graph after each pass.
 class Inspector : public PassObserver {
 public:
@@ -135,6 +113,7 @@ public:
         if (!m_Result.Failed)
             m_Expected = execute(Graph, m_Wanted.Run);
         m_Result.Counts.Exhausted = m_Expected.IsExhausted ? 1 : 0;
+        m_Result.Seen = m_Expected;
     }
     void beforePass(const PassStep& Step, ProgramGraph& Graph) override {
         m_Pass = Step.pPass->Name;
@@ -158,6 +137,8 @@ public:
     void afterAll(ProgramGraph& Graph) override {
         if (m_Wanted.WantsCode && !m_Result.Failed && !m_Expected.IsExhausted)
             makeCode(Graph);
+        if (m_Wanted.WantsFinalText && !m_Result.Failed)
+            m_Result.FinalText = emitProgram(Graph, {}).Source;
     }
     bool wantsToStop() override { return static_cast<bool>(m_Result.Failed); }
 
@@ -176,7 +157,7 @@ private:
             m_IsSSAForm = false; // moved statements stand for their twins
         if (Id != PassId::PropagateSparseConditionalConstant)
             return;
-        m_HasSSAEdges = true;
+        m_HasSSAEdges = m_IsFreshlyPropagated = true;
         m_Result.Counts.DeadNodes +=
             static_cast<std::uint64_t>(m_NodesBefore - Graph.getGraph().number_of_nodes());
     }
@@ -188,9 +169,14 @@ private:
             return fail("checkConsistency", "components and procedures do not agree");
         if (!m_Ears.getKind().empty())
             return fail("checkConsistency: " + m_Ears.getKind(), m_Ears.getText());
-        if (!m_IsSSAForm)
+        const std::string Broken = test::flowFaults(Graph.getGraph());
+        if (!Broken.empty())
+            return fail("control flow: " + withoutNumbers(Broken), Broken);
+        if (!m_WasTransformed)
             return;
-        const std::string Violations = violationsOf(Graph.getGraph());
+        const std::string Violations =
+            passes::verifySSA(Graph.getGraph(), m_IsSSAForm ? passes::Strictness::Full
+                                                            : passes::Strictness::WithoutDominance);
         if (!Violations.empty())
             fail("verifier: " + withoutNumbers(Violations), Violations);
     }
@@ -205,6 +191,9 @@ private:
         Trace Result = Machine.run(Options);
         m_Result.Counts.Statements += Machine.countActions();
         countConstants(Code);
+        if (m_IsFreshlyPropagated)
+            keepVersions(Code);
+        m_IsFreshlyPropagated = false;
         if (!Machine.getFaults().empty() && !m_Result.Failed) {
             std::string Text;
             for (const std::string& Each : Machine.getFaults())
@@ -212,6 +201,18 @@ private:
             fail(kindOfFault(Machine.getFaults().front()), Text);
         }
         return Result;
+    }
+    void keepVersions(const GraphCode& Code) {
+        std::vector<KnownVersion>& Kept = m_Result.Versions;
+        Kept.clear();
+        for (const Version& Each : Code.Versions) {
+            const auto Slot = static_cast<std::size_t>(Each.Slot);
+            Kept.push_back({Each.Serial, std::string(Code.SlotVariables[Slot]->Name),
+                            Each.Claimed.What == Claim::Kind::Constant, Each.IsUndetermined,
+                            Each.Claimed.Low, Each.Claimed.High});
+        }
+        std::sort(Kept.begin(), Kept.end(),
+                  [](const KnownVersion& a, const KnownVersion& b) { return a.Serial < b.Serial; });
     }
     void countConstants(const GraphCode& Code) {
         std::uint64_t Count = 0;
@@ -248,11 +249,10 @@ private:
     bool m_WasTransformed = false;
     bool m_IsSSAForm = false; // and versions still stand where they belong
     bool m_HasSSAEdges = false;
+    bool m_IsFreshlyPropagated = false;
 };
 
-} // namespace
-
-TrialResult runTrial(const Trial& Wanted) {
+TrialResult runAlone(const Trial& Wanted) {
     TrialResult Result;
     SourceFiles Sources;
     Sources.add("fuzz.hpn", Wanted.Text);
@@ -273,6 +273,45 @@ TrialResult runTrial(const Trial& Wanted) {
     pendingWarnings().clear();
     if (!Result.Failed && !Ears.getKind().empty())
         Result.Failed = {Ears.getKind(), "shutdown", Ears.getText()};
+    return Result;
+}
+
+void addTrial(TrialCounts& To, const TrialCounts& From) {
+    for (std::size_t i = 0; i < PassCount; ++i)
+        To.Passes[i] += From.Passes[i];
+    To.Statements += From.Statements;
+}
+
+} // namespace
+
+const char* nameOfPair(PairKind Kind) {
+    static const char* const Names[] = {"none",     "renamed", "reordered", "dead code",
+                                        "pass off", "widened", "twice"};
+    return Names[static_cast<std::size_t>(Kind)];
+}
+
+TrialResult runTrial(const Trial& Wanted) {
+    Trial First = Wanted;
+    First.WantsFinalText = Wanted.WantsFinalText || Wanted.Pair == PairKind::Twice;
+    TrialResult Result = runAlone(First);
+    Trial Variant;
+    if (Result.Failed || !makeVariant(First, Variant))
+        return Result;
+    const TrialResult Other = runAlone(Variant);
+    const std::string Kind = std::string("pair ") + nameOfPair(Wanted.Pair);
+    // A text that was shrunk into a shape that the change was not made for proves nothing.
+    if (Other.Failed.Kind == "reader")
+        return Result;
+    ++Result.Counts.Pairs[static_cast<std::size_t>(Wanted.Pair)];
+    addTrial(Result.Counts, Other.Counts);
+    if (Other.Failed) {
+        Result.Failed = {Kind + ": " + Other.Failed.Kind, Other.Failed.Pass, Other.Failed.Detail};
+        return Result;
+    }
+    const std::string Difference = compareVariants(Wanted.Pair, Result, Other);
+    if (!Difference.empty())
+        Result.Failed = {Kind + ": " + withoutNumbers(Difference.substr(0, Difference.find('('))),
+                         "the whole road", Difference + "\n" + Variant.Text};
     return Result;
 }
 

@@ -38,6 +38,9 @@ int main(int argc, char** argv) {
     App.add_option("--checks-every", Options.ChecksEvery,
                    "The library's own checks are on for one program in so many (0: never)")
         ->capture_default_str();
+    App.add_option("--pairs-every", Options.PairsEvery,
+                   "One program in so many is compared with a changed one (0: none)")
+        ->capture_default_str();
     App.add_option("--failures", Options.MostFailures, "Stop after so many failures")
         ->capture_default_str();
     App.add_option("--out", Options.Directory, "Where failing programs are saved")

@@ -46,3 +46,13 @@ if(TARGET hpncg)
       COMPONENT tools RENAME hpncg)
   endif()
 endif()
+
+# A Debian package tells whose it is.
+if(CMAKE_INSTALL_PREFIX STREQUAL "/usr")
+  foreach(PACKAGE library:libhpnssa${PROJECT_VERSION_MAJOR} development:libhpnssa-dev tools:hpnssa-tools)
+    string(REPLACE ":" ";" PACKAGE ${PACKAGE})
+    list(GET PACKAGE 0 COMPONENT)
+    list(GET PACKAGE 1 NAME)
+    install(FILES cmake/copyright DESTINATION share/doc/${NAME} COMPONENT ${COMPONENT})
+  endforeach()
+endif()

@@ -10,6 +10,14 @@
 #include <sys/stat.h>
 #include <unistd.h>
 
+// Not every system knows them; both are no more than hints or lie in the nature of the system.
+#ifndef O_CLOEXEC
+#define O_CLOEXEC 0
+#endif
+#ifndef O_BINARY
+#define O_BINARY 0
+#endif
+
 namespace hpn {
 
 namespace {
@@ -67,8 +75,10 @@ bool OutputFiles::write(std::string& Why) {
     for (File& Each : m_Files) {
         if (Each.Temporary.empty())
             continue;
-        if (std::rename(Each.Temporary.c_str(), Each.Path.c_str()) != 0) {
-            Why = describeFailure(Each.Path);
+        std::error_code Error;
+        std::filesystem::rename(Each.Temporary, Each.Path, Error);
+        if (Error) {
+            Why = "cannot write '" + Each.Path + "': " + Error.message();
             return false;
         }
         Each.Temporary.clear();
@@ -79,7 +89,7 @@ bool OutputFiles::write(std::string& Why) {
 bool OutputFiles::writeOne(File& Target, std::string& Why) {
     const bool IsDirect = isSpecialFile(Target.Path);
     const std::string Name = IsDirect ? Target.Path : temporaryNameOf(Target.Path);
-    const int Flags = O_WRONLY | O_CLOEXEC | (IsDirect ? 0 : O_CREAT | O_TRUNC);
+    const int Flags = O_WRONLY | O_BINARY | O_CLOEXEC | (IsDirect ? 0 : O_CREAT | O_TRUNC);
     const int Descriptor = ::open(Name.c_str(), Flags, 0666);
     if (Descriptor < 0) {
         Why = describeFailure(Target.Path);

@@ -9,8 +9,15 @@ namespace hpn {
 
 namespace {
 
+// The formats of printf are those of C on every system, whatever the system's own are.
+#ifdef _WIN32
+#define HPN_PRINTF gnu_printf
+#else
+#define HPN_PRINTF printf
+#endif
+
 // A line of a report by a format of printf; lines are short.
-[[gnu::format(printf, 2, 3)]] void appendLine(std::string& Text, const char* Format, ...) {
+[[gnu::format(HPN_PRINTF, 2, 3)]] void appendLine(std::string& Text, const char* Format, ...) {
     char Line[256];
     va_list Arguments;
     va_start(Arguments, Format);

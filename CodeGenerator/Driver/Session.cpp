@@ -228,10 +228,11 @@ std::string describeAssumptions(const std::vector<std::string>& Sentences) {
     return Text;
 }
 
-ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, const Program& Source,
+ExitStatus optimise(const Options& Wanted, const SourceFiles& Sources, Program& Source,
                     const Statistics* pWithout) {
     InternalErrors Errors(Wanted.IsCheckWanted);
     ProgramGraph Graph(Source);
+    Source.dropBodies();
     PassRunner Runner(Graph);
     Watchers Watching(Wanted, Sources, Runner, Errors);
     if (!makeDirectory(Wanted.DotDirectory) || !makeDirectory(Wanted.HtmlDirectory) ||

@@ -5,6 +5,10 @@
 #include <cstdlib>
 #include <exception>
 #include <new>
+#ifdef _WIN32
+#include <fcntl.h>
+#include <io.h>
+#endif
 
 namespace {
 
@@ -16,11 +20,22 @@ namespace {
     std::_Exit(hpn::ExitInternalError);
 }
 
+// Program texts and C are the same bytes on every system: nothing makes two characters of the end
+// of a line.
+void setStreamsToBytes() {
+#ifdef _WIN32
+    _setmode(_fileno(stdin), _O_BINARY);
+    _setmode(_fileno(stdout), _O_BINARY);
+    _setmode(_fileno(stderr), _O_BINARY);
+#endif
+}
+
 } // namespace
 
 // The driver of the reference client: program text in, optimised C out.
 int main(int ArgumentCount, char** pArguments) {
     std::set_new_handler(&endWithoutMemory);
+    setStreamsToBytes();
     try {
         hpn::Options Wanted;
         hpn::ExitStatus Status = hpn::ExitDone;

@@ -6,6 +6,7 @@
 #include "ZfCCfgProcedure.h"
 
 #include <algorithm>
+#include <unordered_set>
 #include <utility>
 
 // Steps:
@@ -177,13 +178,14 @@ void EmittedFunctions::chooseLocals() {
     }
     for (std::size_t i = 0; i < m_Functions.size(); ++i) {
         EmittedFunction& Function = m_Functions[i];
-        const std::vector<const Variable*> Live = liveAtEntry(Function.Flow, Candidates[i]);
+        const std::vector<const Variable*> AllLive = liveAtEntry(Function.Flow, Candidates[i]);
+        // Asked for membership only, never walked.
+        const std::unordered_set<const Variable*> Live(AllLive.begin(), AllLive.end());
+        const std::unordered_set<const Variable*> Parameters(Function.Parameters.begin(),
+                                                             Function.Parameters.end());
         for (const Variable* pVariable : Candidates[i]) {
-            const auto& Parameters = Function.Parameters;
-            const bool IsParameter =
-                std::find(Parameters.begin(), Parameters.end(), pVariable) != Parameters.end();
-            const bool IsLive =
-                !IsParameter && std::find(Live.begin(), Live.end(), pVariable) != Live.end();
+            const bool IsParameter = Parameters.count(pVariable) != 0;
+            const bool IsLive = !IsParameter && Live.count(pVariable) != 0;
             const bool IsOwn = pVariable->pOwner && pVariable->pOwner->IsRecursive;
             m_IsLocal[pVariable->Index] = !IsLive || IsOwn;
             if (!IsParameter && m_IsLocal[pVariable->Index])

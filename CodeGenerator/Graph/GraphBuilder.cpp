@@ -126,8 +126,8 @@ void GraphBuilder::linkBlocks(const FlowSketch& Sketch) {
 void GraphBuilder::noteLabels(const Procedure& Source, const FlowSketch& Sketch) {
     for (const auto& [pLabel, Block] : Sketch.getLabels()) {
         if (m_Nodes[static_cast<std::size_t>(Block)] != nullptr)
-            m_Target.m_Labels.push_back(
-                {pLabel, &Source, m_Nodes[static_cast<std::size_t>(Block)]});
+            m_Target.m_Labels.push_back({pLabel->Position, pLabel->Name, &Source,
+                                         m_Nodes[static_cast<std::size_t>(Block)]});
     }
 }
 

@@ -65,8 +65,8 @@ std::vector<LabelPlace> LabelExtraction::findSharedLabels() {
             Shared.push_back(Label);
     }
     std::sort(Shared.begin(), Shared.end(), [](const LabelPlace& a, const LabelPlace& b) {
-        const SourcePosition Left = a.pLabel->Position;
-        const SourcePosition Right = b.pLabel->Position;
+        const SourcePosition Left = a.Position;
+        const SourcePosition Right = b.Position;
         return Left.File != Right.File ? Left.File > Right.File : Left.Offset > Right.Offset;
     });
     return Shared;
@@ -184,7 +184,7 @@ void LabelExtraction::extract(const LabelPlace& Label) {
         return;
     if (const char* pWhy = findObstacle(Label))
         return refuse(Label, pWhy);
-    if (!mayRewrite("procedure made of a label", Label.pLabel->Position))
+    if (!mayRewrite("procedure made of a label", Label.Position))
         return;
     // The call that the library gives back would be one more than there were jumps.
     ZfCCfgFactory::getInstance()->delStatement(m_Graph.makeProcedureAndCall(Label.Node));
@@ -264,8 +264,7 @@ bool LabelExtraction::entersLoopFromElsewhere() {
 
 void LabelExtraction::refuse(const LabelPlace& Label, const char* Why) {
     m_Target.getRemarks().push_back(
-        {Label.pLabel->Position,
-         "label '" + std::string(Label.pLabel->Name) + "' stays a label: " + Why});
+        {Label.Position, "label '" + std::string(Label.Name) + "' stays a label: " + Why});
 }
 
 // Step 3
@@ -318,16 +317,16 @@ const Procedure* LabelExtraction::findOrigin(leda::node Entry) const {
 
 /// An extracted procedure begins with what a label began, or else with a join behind one.
 void LabelExtraction::nameProcedures() {
-    std::unordered_map<leda::node, const Statement*> LabelAt; // looked up only
+    std::unordered_map<leda::node, std::string_view> LabelAt; // looked up only
     for (const LabelPlace& Label : m_Target.getLabels())
-        LabelAt.emplace(Label.Node, Label.pLabel);
+        LabelAt.emplace(Label.Node, Label.Name);
     std::unordered_set<std::string> Marked; // looked up only
     for (leda::node v : m_Graph.all_nodes()) {
         const Procedure* pOrigin = m_Graph[v]->isEntryNode() != nullptr ? findOrigin(v) : nullptr;
         if (pOrigin == nullptr)
             continue;
         const auto Label = LabelAt.find(m_Graph.target(m_Graph.first_adj_edge(v)));
-        const std::string_view Kind = Label != LabelAt.end() ? Label->second->Name : "shared";
+        const std::string_view Kind = Label != LabelAt.end() ? Label->second : "shared";
         const std::string Name = m_Graph[v]->getProcedure()->getName().cstring();
         m_Target.noteExtracted(Name, std::string(pOrigin->Name) + "_" + std::string(Kind));
         if (m_Target.isReachableFromOutside(*pOrigin))

@@ -23,7 +23,8 @@ namespace hpn {
 
 /// A label of the program that control reaches, and the node that it begins.
 struct LabelPlace {
-    const Statement* pLabel;
+    SourcePosition Position;
+    std::string_view Name;
     const Procedure* pOwner;
     leda::node Node;
 };
@@ -40,8 +41,9 @@ struct Remark {
 class ProgramGraph {
 public:
     /// Boots the library and fills the graph from a checked program, which must outlive this
-    /// object: one component for each procedure, every block stamped, every call at the end of a
-    /// block of its own, entries set, no exit nodes yet.
+    /// object, but for its statements and expressions: nothing refers to them afterwards. One
+    /// component for each procedure, every block stamped, every call at the end of a block of its
+    /// own, entries set, no exit nodes yet.
     explicit ProgramGraph(const Program& Source);
     ~ProgramGraph();
     ProgramGraph(const ProgramGraph&) = delete;

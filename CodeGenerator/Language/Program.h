@@ -219,6 +219,10 @@ public:
         --m_Left;
         return ::new (static_cast<void*>((m_pNext++)->Bytes)) Node;
     }
+    void clear() {
+        m_Chunks.clear();
+        m_Left = 0;
+    }
 
 private:
     struct Room {
@@ -246,6 +250,16 @@ struct Program {
     /// Takes room for a node; the node lives as long as the program.
     Expression* newExpression() { return m_Expressions.make(); }
     Statement* newStatement() { return m_Statements.make(); }
+    /// Frees all statements and expressions, the greater part of a program by far, once nobody
+    /// needs them any more; declarations stay.
+    void dropBodies() {
+        for (Procedure& Each : Procedures)
+            Each.pBody = nullptr;
+        for (Variable& Each : Variables)
+            Each.pInitializer = nullptr;
+        m_Expressions.clear();
+        m_Statements.clear();
+    }
     /// The built-in type of a storage.
     const Type* builtIn(BaseType Base) const { return &Types[static_cast<std::size_t>(Base)]; }
 

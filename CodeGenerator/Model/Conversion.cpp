@@ -91,62 +91,107 @@ ValueRange emptyRange() {
     return Result;
 }
 
+/// The distance from zero of the grid's number nearest to it, zero itself aside.
+double leastOnGrid(const Type& Of) {
+    if (Of.Offset == 0.0)
+        return Of.Lsb;
+    const auto Nearest = static_cast<std::int64_t>(std::trunc(-Of.Offset / Of.Lsb));
+    double Least = Infinity;
+    for (std::int64_t Raw = Nearest - 1; Raw <= Nearest + 1; ++Raw) {
+        const double Distance = std::fabs(numberOfRaw(Raw, Of));
+        Least = Distance > 0.0 ? std::min(Least, Distance) : Least;
+    }
+    return Least;
+}
+
+/// The grid is one that doubles hit exactly: its numbers are multiples of a small power of two.
+bool isExactGrid(const Type& Of) {
+    constexpr double UnitsPerOne = 1048576.0;
+    const double Step = Of.Lsb * UnitsPerOne;
+    const double Start = Of.Offset * UnitsPerOne;
+    return std::trunc(Step) == Step && std::trunc(Start) == Start;
+}
+
 /// Numbers of an interval of raw numbers that lies in the storage.
 ValueRange intervalOfRaws(std::int64_t Low, std::int64_t High, const Type& Of) {
-    const bool IsWholeGrid =
-        !isScaled(Of) || (std::trunc(Of.Lsb) == Of.Lsb && std::trunc(Of.Offset) == Of.Offset);
-    return interval(numberOfRaw(Low, Of), numberOfRaw(High, Of), IsWholeGrid);
+    if (!isScaled(Of))
+        return interval(numberOfRaw(Low, Of), numberOfRaw(High, Of), true);
+    const bool IsWholeGrid = std::trunc(Of.Lsb) == Of.Lsb && std::trunc(Of.Offset) == Of.Offset;
+    ValueRange Result = interval(numberOfRaw(Low, Of), numberOfRaw(High, Of), IsWholeGrid);
+    if (isExactGrid(Of))
+        setStep(Result, Of.Lsb);
+    else
+        Result.Least = leastOnGrid(Of);
+    return Result;
 }
 
-/// Wraps an interval of raw numbers: it stays together if it crosses no border of the storage's
-/// period, else everything is possible.
-ValueRange wrapInterval(std::int64_t Low, std::int64_t High, const Type& To) {
-    const std::int64_t WrappedLow = wrapRaw(Low, To.Base);
-    const std::int64_t WrappedHigh = wrapRaw(High, To.Base);
-    // The width is compared unsigned: it can exceed the signed range.
+/// The step of what a range with a grid becomes in raw numbers, before they wrap; 1 if it is finer
+/// or unknown.
+std::int64_t stepInRaws(const ValueRange& From, const Type& To) {
+    const double Step = From.Step > 0.0 ? From.Step : From.IsIntegral ? 1.0 : 0.0;
+    if (!isScaled(To))
+        return Step >= 1.0 && From.IsIntegral ? static_cast<std::int64_t>(Step) : 1;
+    const double Steps = Step / To.Lsb;
+    const double First = (From.Low - To.Offset) / To.Lsb;
+    const bool IsOnGrid = isExactGrid(To) && std::trunc(First) == First &&
+                          std::fabs(From.Low) < 4294967296.0 && std::fabs(From.High) < 4294967296.0;
+    return IsOnGrid && Steps >= 1.0 && std::trunc(Steps) == Steps && Steps < 4294967296.0
+               ? static_cast<std::int64_t>(Steps)
+               : 1;
+}
+
+/// Wraps an interval of raw numbers: the storage is a window that slides over it.
+ValueRange wrapInterval(std::int64_t Low, std::int64_t High, std::int64_t Step, const Type& To) {
+    const std::int64_t First = smallestRaw(To.Base);
+    if (Low >= First && High <= greatestRaw(To.Base))
+        return intervalOfRaws(Low, High, To);
+    const std::int64_t Period = std::int64_t{1} << bitsOf(To.Base);
+    // The width can exceed the signed range.
     const std::uint64_t Width = static_cast<std::uint64_t>(High) - static_cast<std::uint64_t>(Low);
-    const std::uint64_t Period = std::uint64_t{1} << bitsOf(To.Base);
-    if (Width < Period && WrappedLow <= WrappedHigh)
-        return intervalOfRaws(WrappedLow, WrappedHigh, To);
-    return intervalOfRaws(smallestRaw(To.Base), greatestRaw(To.Base), To);
+    const Residues Wrapped = residuesOf(Low % Period - First, Width, Step, Period);
+    return intervalOfRaws(Wrapped.Low + First, Wrapped.High + First, To);
 }
 
-/// Numbers in [Low, High] to an integer storage: those in reach of the intermediate integer wrap,
-/// those out of reach all become its smallest number.
-ValueRange convertToInteger(double Low, double High, const Type& To) {
-    const double WholeLow = stepToWhole(Low, To);
-    const double WholeHigh = stepToWhole(High, To);
+/// Numbers of a range to an integer storage: those in reach of the intermediate integer wrap, those
+/// out of reach all become its smallest number.
+ValueRange convertToInteger(const ValueRange& From, const Type& To) {
+    const double WholeLow = stepToWhole(From.Low, To);
+    const double WholeHigh = stepToWhole(From.High, To);
     const double Smallest = goesThrough32(To) ? -2147483648.0 : -9223372036854775808.0;
     const double Greatest = goesThrough32(To) ? 2147483647.0 : 9223372036854774784.0;
+    const bool IsLost = WholeLow < Smallest || WholeHigh > Greatest;
     ValueRange Result = emptyRange();
     if (WholeLow <= Greatest && WholeHigh >= Smallest)
         Result = wrapInterval(static_cast<std::int64_t>(std::max(WholeLow, Smallest)),
-                              static_cast<std::int64_t>(std::min(WholeHigh, Greatest)), To);
-    if (WholeLow < Smallest || WholeHigh > Greatest) {
+                              static_cast<std::int64_t>(std::min(WholeHigh, Greatest)),
+                              IsLost ? 1 : stepInRaws(From, To), To);
+    if (IsLost) {
         const std::int64_t Lost = rawOfWhole(-Infinity, To);
         Result = hull(Result, intervalOfRaws(Lost, Lost, To));
     }
     return Result;
 }
 
-ValueRange convertToBool(double Low, double High) {
-    if (Low == 0.0 && High == 0.0)
+ValueRange convertToBool(const ValueRange& From) {
+    if (From.Low == 0.0 && From.High == 0.0)
         return rangeOfNumber(0.0);
-    if (Low > 0.0 || High < 0.0)
-        return rangeOfNumber(1.0);
-    return interval(0.0, 1.0, true);
+    return cutRange(From, 0.0, 0.0).isEmpty() ? rangeOfNumber(1.0) : interval(0.0, 1.0, true);
 }
 
-ValueRange convertIntervalInStorage(double Low, double High, bool IsIntegral, const Type& To) {
+ValueRange convertIntervalInStorage(const ValueRange& From, const Type& To) {
     switch (To.Base) {
-    case BaseType::Float64:
-        return interval(Low, High, IsIntegral);
+    case BaseType::Float64: {
+        ValueRange Result = From;
+        Result.MayBeNaN = false;
+        Result.MayBeNegativeZero = false;
+        return Result;
+    }
     case BaseType::Float32:
-        return interval(roundToSingle(Low), roundToSingle(High), IsIntegral);
+        return interval(roundToSingle(From.Low), roundToSingle(From.High), From.IsIntegral);
     case BaseType::Bool:
-        return convertToBool(Low, High);
+        return convertToBool(From);
     default:
-        return convertToInteger(Low, High, To);
+        return convertToInteger(From, To);
     }
 }
 
@@ -187,19 +232,18 @@ double convertNumber(double Number, const Type& To) {
 
 ValueRange convertRange(const ValueRange& From, const Type& To) {
     ValueRange Result = emptyRange();
-    double Low = From.Low;
-    double High = From.High;
-    if (To.SaturatesHigh && !From.isEmpty() && High > To.Upper) {
+    ValueRange Rest = From;
+    if (To.SaturatesHigh && !Rest.isEmpty() && Rest.High > To.Upper) {
         Result = hull(Result, rangeOfNumber(To.Upper + 0.0));
-        High = To.Upper;
+        Rest = cutRange(Rest, Rest.Low, To.Upper);
     }
-    if (To.SaturatesLow && !From.isEmpty() && Low < To.Lower) {
+    if (To.SaturatesLow && !From.isEmpty() && From.Low < To.Lower) {
         Result = hull(Result, rangeOfNumber(To.Lower + 0.0));
-        Low = To.Lower;
+        Rest = cutRange(Rest, To.Lower, Rest.High);
     }
     // What the clips leave can be empty: all of the range lay beyond one limit.
-    if (Low <= High)
-        Result = hull(Result, convertIntervalInStorage(Low, High, From.IsIntegral, To));
+    if (!Rest.isEmpty())
+        Result = hull(Result, convertIntervalInStorage(Rest, To));
     if (From.MayBeNaN)
         Result = hull(Result, rangeOfNumber(convertNumber(std::nan(""), To)));
     return Result;

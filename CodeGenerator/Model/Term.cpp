@@ -95,8 +95,7 @@ ValueRange rangeOfRead(ZfCCfgVariable* pVariable, RangeSource Source) {
     if (!Minimum.isConstant() || !Maximum.isConstant() ||
         !(Minimum.getValue() <= Maximum.getValue()))
         return Range;
-    Range.Low = Minimum.getValue();
-    Range.High = Maximum.getValue();
+    Range = cutRange(Range, Minimum.getValue(), Maximum.getValue());
     Range.MayBeNaN = false;
     return Range;
 }

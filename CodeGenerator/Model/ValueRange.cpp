@@ -8,6 +8,7 @@
 #include <cmath>
 #include <cstdint>
 #include <limits>
+#include <numeric>
 
 // Interval arithmetic over the number model.
 //
@@ -70,8 +71,108 @@ ValueRange truthRange(bool CanBeFalse, bool CanBeTrue) {
     return makeInterval(CanBeFalse ? 0.0 : 1.0, CanBeTrue ? 1.0 : 0.0, true);
 }
 
+// Grids. The numbers on one are whole multiples of a unit and below a limit, so that sums and
+// differences of them are exact.
+
+constexpr double UnitsPerOne = 1048576.0;
+constexpr double GridLimit = 4294967296.0;
+
+bool isInUnits(double Number) {
+    return std::fabs(Number) <= GridLimit && isWhole(Number * UnitsPerOne);
+}
+
+std::int64_t unitsOf(double Number) {
+    return static_cast<std::int64_t>(Number * UnitsPerOne);
+}
+
+/// In units: 0 for a single number, which is on every grid that it begins; -1: on no grid.
+std::int64_t stepInUnits(const ValueRange& Range) {
+    if (Range.isEmpty())
+        return 0;
+    if (!isInUnits(Range.Low) || !isInUnits(Range.High))
+        return -1;
+    if (Range.Low == Range.High)
+        return 0;
+    return Range.Step > 0.0 ? unitsOf(Range.Step) : Range.IsIntegral ? unitsOf(1.0) : -1;
+}
+
+bool isGridded(const ValueRange& Range) {
+    return Range.Step > 0.0;
+}
+
+/// The grid of sums and differences of numbers of both. Whole numbers without gaps need none.
+void setStepOfSum(ValueRange& Result, const ValueRange& a, const ValueRange& b) {
+    if (!isGridded(a) && !isGridded(b))
+        return;
+    const std::int64_t Left = stepInUnits(a);
+    const std::int64_t Right = stepInUnits(b);
+    if (Left >= 0 && Right >= 0)
+        setStep(Result, static_cast<double>(std::gcd(Left, Right)) / UnitsPerOne);
+}
+
+/// The grid of both together.
+void setStepOfHull(ValueRange& Result, const ValueRange& a, const ValueRange& b) {
+    if (!isGridded(a) && !isGridded(b))
+        return;
+    const std::int64_t Left = stepInUnits(a);
+    const std::int64_t Right = stepInUnits(b);
+    if (Left < 0 || Right < 0)
+        return;
+    const bool HasBoth = !a.isEmpty() && !b.isEmpty();
+    const std::int64_t Distance = HasBoth ? unitsOf(a.Low) - unitsOf(b.Low) : 0;
+    setStep(Result, static_cast<double>(std::gcd(std::gcd(Left, Right), Distance)) / UnitsPerOne);
+}
+
+/// Infinite if there is no number but zero, 0 if nothing is known.
+double leastOf(const ValueRange& Range) {
+    if (Range.isEmpty() || (Range.Low == 0.0 && Range.High == 0.0))
+        return Infinity;
+    if (Range.Least > 0.0)
+        return Range.Least;
+    if (Range.Low > 0.0 || Range.High < 0.0)
+        return std::min(std::fabs(Range.Low), std::fabs(Range.High));
+    return Range.IsIntegral ? 1.0 : 0.0;
+}
+
+void setLeastOfHull(ValueRange& Result, const ValueRange& a, const ValueRange& b) {
+    if (a.Least > 0.0 || b.Least > 0.0) {
+        const double Least = std::min(leastOf(a), leastOf(b));
+        Result.Least = Least < Infinity ? Least : 0.0;
+    }
+}
+
+/// The first number of the range that is not below a number; infinite if there is none.
+double alignUp(const ValueRange& Range, double Number) {
+    if (Number <= Range.Low || Number > Range.High)
+        return Number <= Range.Low ? Range.Low : Infinity;
+    if (!isGridded(Range))
+        return (Range.IsIntegral ? std::ceil(Number) : Number) + 0.0; // no end is a negative zero
+    double Aligned = Range.Low + std::floor((Number - Range.Low) / Range.Step) * Range.Step;
+    while (Aligned < Number)
+        Aligned += Range.Step;
+    return Aligned;
+}
+
+/// The last number of the range that is not above a number; infinite if there is none.
+double alignDown(const ValueRange& Range, double Number) {
+    if (Number >= Range.High || Number < Range.Low)
+        return Number >= Range.High ? Range.High : -Infinity;
+    if (!isGridded(Range))
+        return (Range.IsIntegral ? std::floor(Number) : Number) + 0.0;
+    double Aligned = Range.High - std::floor((Range.High - Number) / Range.Step) * Range.Step;
+    while (Aligned > Number)
+        Aligned -= Range.Step;
+    return Aligned;
+}
+
+bool isOnGrid(const ValueRange& Range, double Number) {
+    if (isGridded(Range))
+        return std::fmod(Number - Range.Low, Range.Step) == 0.0;
+    return !Range.IsIntegral || isWhole(Number);
+}
+
 bool holdsZero(const ValueRange& Range) {
-    return Range.Low <= 0.0 && Range.High >= 0.0;
+    return Range.Low <= 0.0 && Range.High >= 0.0 && isOnGrid(Range, 0.0);
 }
 
 bool holdsOtherThan(const ValueRange& Range, double Number) {
@@ -85,20 +186,21 @@ struct Piece {
     double High;
 };
 
-/// The pieces of a range, at most six. Ordinary ends are cut at the smallest number of each sign,
-/// whole ranges at 1.
+/// The pieces of a range, at most six. Ordinary ends are cut at the smallest numbers of each sign
+/// that the range can hold.
 class SignPieces {
 public:
     explicit SignPieces(const ValueRange& Range) {
         if (Range.isEmpty())
             return;
-        const double Step = Range.IsIntegral ? 1.0 : Smallest;
+        const double Nearest = std::max(Range.Least, Smallest);
         add(Range, -Infinity, -Infinity);
-        add(Range, -Greatest, -Step);
+        add(Range, -Greatest, -Nearest);
         if (Range.MayBeNegativeZero)
             m_Pieces[m_Count++] = {-0.0, -0.0};
-        add(Range, 0.0, 0.0);
-        add(Range, Step, Greatest);
+        if (holdsZero(Range))
+            m_Pieces[m_Count++] = {0.0, 0.0};
+        add(Range, Nearest, Greatest);
         add(Range, Infinity, Infinity);
     }
     const Piece* begin() const { return m_Pieces.data(); }
@@ -106,7 +208,7 @@ public:
 
 private:
     void add(const ValueRange& Range, double Low, double High) {
-        const Piece Cut = {std::max(Range.Low, Low), std::min(Range.High, High)};
+        const Piece Cut = {alignUp(Range, Low), alignDown(Range, High)};
         if (Cut.Low <= Cut.High)
             m_Pieces[m_Count++] = Cut;
     }
@@ -148,6 +250,7 @@ ValueRange combinePieces(Operator Op, const ValueRange& Left, const ValueRange& 
 
 ValueRange rangeOfSum(Operator Op, const ValueRange& Left, const ValueRange& Right) {
     ValueRange Result = combinePieces(Op, Left, Right);
+    setStepOfSum(Result, Left, Right);
     Result.MayBeNaN = Result.MayBeNaN || Left.MayBeNaN || Right.MayBeNaN;
     return Result;
 }
@@ -188,6 +291,8 @@ ValueRange rangeOfExtremum(Operator Op, const ValueRange& Left, const ValueRange
         Result.MayBeNegativeZero =
             (Left.MayBeNegativeZero && LeftZeroWins) || (Right.MayBeNegativeZero && RightZeroWins);
         Result.IsIntegral = Result.IsIntegral || (Left.IsIntegral && Right.IsIntegral);
+        setStepOfHull(Result, Left, Right);
+        setLeastOfHull(Result, Left, Right);
     }
     if (Left.MayBeNaN) {
         ValueRange RightNumbers = Right;
@@ -200,14 +305,20 @@ ValueRange rangeOfExtremum(Operator Op, const ValueRange& Left, const ValueRange
 
 // Comparisons
 
+/// The ranges overlap, each on its grid, and their grids can meet.
 bool canBeEqual(const ValueRange& Left, const ValueRange& Right) {
-    double Low = std::max(Left.Low, Right.Low);
-    double High = std::min(Left.High, Right.High);
-    if (Left.IsIntegral || Right.IsIntegral) {
-        Low = std::ceil(Low);
-        High = std::floor(High);
-    }
-    return Low <= High;
+    const double Low = std::max(Left.Low, Right.Low);
+    const double High = std::min(Left.High, Right.High);
+    const ValueRange a = cutRange(Left, Low, High);
+    const ValueRange b = cutRange(Right, Low, High);
+    if (a.isEmpty() || b.isEmpty() || (!isGridded(a) && !isGridded(b)))
+        return !a.isEmpty() && !b.isEmpty();
+    if (a.Low == a.High || b.Low == b.High)
+        return a.Low == a.High ? b.contains(a.Low) : a.contains(b.Low);
+    const std::int64_t StepA = stepInUnits(a);
+    const std::int64_t StepB = stepInUnits(b);
+    return StepA < 0 || StepB < 0 ||
+           (unitsOf(a.Low) - unitsOf(b.Low)) % std::gcd(StepA, StepB) == 0;
 }
 
 ValueRange rangeOfEquality(bool HoldsOnEqual, const ValueRange& Left, const ValueRange& Right) {
@@ -235,6 +346,7 @@ ValueRange rangeOfOrder(bool HoldsOnEqual, const ValueRange& Left, const ValueRa
 struct IntPiece {
     std::int64_t Low;
     std::int64_t High;
+    std::int64_t Step; ///< 1 or more; what the numbers in between have in common
 };
 
 /// What the truncation to 32 bits makes of a range, in pieces of one sign: negative ones, others,
@@ -245,56 +357,62 @@ public:
         bool IsLost = Range.MayBeNaN;
         if (!Range.isEmpty()) {
             IsLost = IsLost || Range.Low <= -2147483649.0 || Range.High >= 2147483648.0;
-            const double Low = std::max(std::trunc(Range.Low), -2147483648.0);
-            const double High = std::min(std::trunc(Range.High), 2147483647.0);
+            // Whole numbers stay on their grid.
+            const double Margin = Range.IsIntegral ? 0.0 : 1.0;
+            const ValueRange Fitting =
+                cutRange(Range, -2147483648.0 - Margin, 2147483647.0 + Margin);
+            const double Low = std::max(std::trunc(Fitting.Low), -2147483648.0);
+            const double High = std::min(std::trunc(Fitting.High), 2147483647.0);
+            m_Step = Range.IsIntegral && Fitting.Step > 0.0
+                         ? static_cast<std::int64_t>(Fitting.Step)
+                         : 1;
             if (Low <= High)
                 addBySign(static_cast<std::int64_t>(Low), static_cast<std::int64_t>(High));
         }
         if (IsLost)
-            m_Pieces[m_Count++] = {-2147483648LL, -2147483648LL};
+            m_Pieces[m_Count++] = {-2147483648LL, -2147483648LL, 1};
     }
     const IntPiece* begin() const { return m_Pieces.data(); }
     const IntPiece* end() const { return m_Pieces.data() + m_Count; }
 
 private:
     void addBySign(std::int64_t Low, std::int64_t High) {
-        if (Low < 0)
-            m_Pieces[m_Count++] = {Low, std::min<std::int64_t>(High, -1)};
-        if (High >= 0)
-            m_Pieces[m_Count++] = {std::max<std::int64_t>(Low, 0), High};
+        if (Low >= 0)
+            return add(Low, High);
+        // The last number below zero is the one that the distance to -1 leaves.
+        const std::int64_t LastNegative = High < 0 ? High : -1 - (-1 - Low) % m_Step;
+        add(Low, LastNegative);
+        if (LastNegative + m_Step <= High)
+            add(LastNegative + m_Step, High);
+    }
+    void add(std::int64_t Low, std::int64_t High) {
+        m_Pieces[m_Count++] = {Low, High, Low == High ? 1 : m_Step};
     }
 
     std::array<IntPiece, 3> m_Pieces;
     std::size_t m_Count = 0;
+    std::int64_t m_Step = 1;
 };
-
-/// Remainders of numbers that are not negative by one divisor.
-IntPiece remainderBy(const IntPiece& Dividend, std::int64_t Divisor) {
-    const std::int64_t Low = Dividend.Low % Divisor;
-    const std::int64_t High = Dividend.High % Divisor;
-    if (Dividend.High - Dividend.Low < Divisor && Low <= High)
-        return {Low, High};
-    return {0, Divisor - 1};
-}
 
 /// Remainders of numbers that are not negative by divisors from 1 up. Few divisors are gone through
 /// one by one.
-IntPiece remainder(const IntPiece& Dividend, const IntPiece& Divisor) {
+Residues remainder(const IntPiece& Dividend, const IntPiece& Divisor) {
     constexpr std::int64_t FewDivisors = 32;
     if (Dividend.High < Divisor.Low)
-        return Dividend;
-    if (Divisor.High - Divisor.Low >= FewDivisors)
+        return {Dividend.Low, Dividend.High};
+    if ((Divisor.High - Divisor.Low) / Divisor.Step >= FewDivisors)
         return {0, std::min(Dividend.High, Divisor.High - 1)};
-    IntPiece Result = remainderBy(Dividend, Divisor.Low);
-    for (std::int64_t m = Divisor.Low + 1; m <= Divisor.High; ++m) {
-        const IntPiece Next = remainderBy(Dividend, m);
+    const auto Width = static_cast<std::uint64_t>(Dividend.High - Dividend.Low);
+    Residues Result = residuesOf(Dividend.Low, Width, Dividend.Step, Divisor.Low);
+    for (std::int64_t m = Divisor.Low + Divisor.Step; m <= Divisor.High; m += Divisor.Step) {
+        const Residues Next = residuesOf(Dividend.Low, Width, Dividend.Step, m);
         Result = {std::min(Result.Low, Next.Low), std::max(Result.High, Next.High)};
     }
     return Result;
 }
 
 IntPiece magnitude(const IntPiece& Range) {
-    return Range.Low < 0 ? IntPiece{-Range.High, -Range.Low} : Range;
+    return Range.Low < 0 ? IntPiece{-Range.High, -Range.Low, Range.Step} : Range;
 }
 
 /// The sign of a remainder is the dividend's, the divisor's does not count; a divisor of zero gives
@@ -304,37 +422,32 @@ ValueRange remainderOfPieces(const IntPiece& Left, const IntPiece& Right) {
     IntPiece Divisor = magnitude(Right);
     if (Divisor.Low == 0) {
         Result = integers(0, 0);
-        Divisor.Low = 1;
+        Divisor.Low = Divisor.Step;
     }
     if (Divisor.Low > Divisor.High)
         return Result;
-    const IntPiece Rest = remainder(magnitude(Left), Divisor);
+    const Residues Rest = remainder(magnitude(Left), Divisor);
     return hull(Result,
                 Left.Low < 0 ? integers(-Rest.High, -Rest.Low) : integers(Rest.Low, Rest.High));
 }
 
-/// Shifting by one count. To the left the window of 32 bits slides over the result: inside one
-/// window the ends hold, across a border both the smallest number and the greatest multiple of the
-/// shift's unit occur.
+/// Shifting by one count. To the left the window of 32 bits slides over the result.
 ValueRange shiftByCount(Operator Op, const IntPiece& Left, unsigned Count) {
     if (Op == Operator::ShiftRight)
         return integers(Left.Low >> Count, Left.High >> Count);
     constexpr std::int64_t Half = std::int64_t{1} << 31;
     constexpr std::int64_t Window = std::int64_t{1} << 32;
     const std::int64_t Unit = std::int64_t{1} << Count;
-    const std::int64_t Low = Left.Low * Unit + Half;
-    const std::int64_t High = Left.High * Unit + Half;
-    const std::int64_t Base = Low & ~(Window - 1);
-    if (High - Base >= Window)
-        return integers(-Half, Half - Unit);
-    return integers(Low - Base - Half, High - Base - Half);
+    const auto Width = static_cast<std::uint64_t>((Left.High - Left.Low) * Unit);
+    const Residues Shifted = residuesOf(Left.Low * Unit + Half, Width, Left.Step * Unit, Window);
+    return integers(Shifted.Low - Half, Shifted.High - Half);
 }
 
-/// All counts of a piece; only their low five bits count.
+/// All counts of a piece; only their low five bits count, so they repeat after 32 of them.
 ValueRange shiftByPiece(Operator Op, const IntPiece& Left, const IntPiece& Counts) {
     ValueRange Result = emptyRange();
-    const std::int64_t Last = std::min(Counts.High, Counts.Low + 31);
-    for (std::int64_t Count = Counts.Low; Count <= Last; ++Count)
+    std::int64_t Count = Counts.Low;
+    for (int i = 0; i < 32 && Count <= Counts.High; ++i, Count += Counts.Step)
         Result = hull(Result, shiftByCount(Op, Left, static_cast<unsigned>(Count & 31)));
     return Result;
 }
@@ -409,18 +522,58 @@ ValueRange signedRange(std::uint32_t Low, std::uint32_t High) {
     return integers(static_cast<std::int32_t>(Low), static_cast<std::int32_t>(High));
 }
 
-/// Bits of pieces of one sign each: the sign bit of the result is the same throughout.
-ValueRange bitsOfPieces(Operator Op, const IntPiece& Left, const IntPiece& Right) {
-    const auto a = static_cast<std::uint32_t>(Left.Low);
-    const auto b = static_cast<std::uint32_t>(Left.High);
-    const auto c = static_cast<std::uint32_t>(Right.Low);
-    const auto d = static_cast<std::uint32_t>(Right.High);
+/// How many low bits all numbers of a piece have in common.
+unsigned commonLowBits(const IntPiece& Piece) {
+    if (Piece.Low == Piece.High)
+        return 31;
+    unsigned Bits = 0;
+    while ((Piece.Step >> Bits & 1) == 0)
+        ++Bits;
+    return std::min(Bits, 31U);
+}
+
+/// Bounds of the bits from bit Low up, the lower ones cut off.
+Residues boundsOfHighBits(Operator Op, const IntPiece& Left, const IntPiece& Right, unsigned Low) {
+    const auto a = static_cast<std::uint32_t>(Left.Low) >> Low;
+    const auto b = static_cast<std::uint32_t>(Left.High) >> Low;
+    const auto c = static_cast<std::uint32_t>(Right.Low) >> Low;
+    const auto d = static_cast<std::uint32_t>(Right.High) >> Low;
     if (Op == Operator::BitOr)
-        return signedRange(smallestOr(a, b, c, d), greatestOr(a, b, c, d));
+        return {smallestOr(a, b, c, d), greatestOr(a, b, c, d)};
     if (Op == Operator::BitXor)
-        return signedRange(smallestXor(a, b, c, d), greatestXor(a, b, c, d));
+        return {smallestXor(a, b, c, d), greatestXor(a, b, c, d)};
     // x & y is ~(~x | ~y); the complement turns the order round.
-    return signedRange(~greatestOr(~b, ~a, ~d, ~c), ~smallestOr(~b, ~a, ~d, ~c));
+    return {~greatestOr(~b, ~a, ~d, ~c), ~smallestOr(~b, ~a, ~d, ~c)};
+}
+
+/// Puts the bounds of the low bits below those of the high ones.
+ValueRange joinBits(const Residues& HighBits, unsigned Low, std::uint32_t Least,
+                    std::uint32_t Most) {
+    return signedRange(static_cast<std::uint32_t>(HighBits.Low) << Low | Least,
+                       static_cast<std::uint32_t>(HighBits.High) << Low | Most);
+}
+
+/// Bits of pieces of one sign each: the sign bit of the result is the same throughout. Low bits
+/// that are the same throughout both pieces give the same low bits, and the bounds are those of the
+/// others. Low bits that are the same in one piece only bound those of `&` and `|`.
+ValueRange bitsOfPieces(Operator Op, const IntPiece& Left, const IntPiece& Right) {
+    const unsigned LeftBits = commonLowBits(Left);
+    const unsigned RightBits = commonLowBits(Right);
+    const unsigned Both = std::min(LeftBits, RightBits);
+    const unsigned One = std::max(LeftBits, RightBits);
+    const std::uint32_t Mask = (1U << Both) - 1;
+    const auto Same = static_cast<std::uint32_t>(static_cast<std::int64_t>(
+        computeBinary(Op, static_cast<double>(Left.Low), static_cast<double>(Right.Low))));
+    const ValueRange Result =
+        joinBits(boundsOfHighBits(Op, Left, Right, Both), Both, Same & Mask, Same & Mask);
+    if (One == Both || One == 31 || Op == Operator::BitXor)
+        return Result;
+    const std::uint32_t Wide = (1U << One) - 1;
+    const auto Known = static_cast<std::uint32_t>(LeftBits == One ? Left.Low : Right.Low) & Wide;
+    const Residues HighBits = boundsOfHighBits(Op, Left, Right, One);
+    const ValueRange Other = Op == Operator::BitAnd ? joinBits(HighBits, One, 0, Known)
+                                                    : joinBits(HighBits, One, Known, Wide);
+    return cutRange(Result, Other.Low, Other.High);
 }
 
 ValueRange rangeOfIntegerOperator(Operator Op, const ValueRange& Left, const ValueRange& Right) {
@@ -471,11 +624,12 @@ ValueRange rangeOfComplement(const ValueRange& Operand) {
 }
 
 ValueRange rangeOfAbsolute(const ValueRange& Operand) {
-    ValueRange Result = Operand;
     if (Operand.isEmpty() || Operand.Low >= 0.0)
-        return Result;
-    Result.High = std::max(-Operand.Low, Operand.High);
-    Result.Low = Operand.High < 0.0 ? -Operand.High : 0.0;
+        return Operand;
+    // A negative zero stays one.
+    ValueRange Result = hull(rangeOfNegation(cutRange(Operand, -Infinity, -Smallest)),
+                             cutRange(Operand, 0.0, Infinity));
+    Result.MayBeNegativeZero = Operand.MayBeNegativeZero;
     return Result;
 }
 
@@ -497,7 +651,9 @@ bool ValueRange::contains(double Number) const {
         return MayBeNaN;
     if (isNegativeZero(Number) && !MayBeNegativeZero)
         return false;
-    return Low <= Number && Number <= High && (!IsIntegral || isWhole(Number));
+    if (Least > 0.0 && Number != 0.0 && std::fabs(Number) < Least)
+        return false;
+    return Low <= Number && Number <= High && isOnGrid(*this, Number);
 }
 
 bool ValueRange::isWithin(const ValueRange& Other) const {
@@ -531,7 +687,57 @@ ValueRange hull(const ValueRange& a, const ValueRange& b) {
     Result.MayBeNaN = a.MayBeNaN || b.MayBeNaN;
     Result.MayBeNegativeZero = a.MayBeNegativeZero || b.MayBeNegativeZero;
     Result.IsIntegral = (a.IsIntegral || a.isEmpty()) && (b.IsIntegral || b.isEmpty());
+    setStepOfHull(Result, a, b);
+    setLeastOfHull(Result, a, b);
     return Result;
+}
+
+void setStep(ValueRange& Range, double Step) {
+    if (Range.Low < Range.High && Step > 0.0 && !(Range.IsIntegral && Step == 1.0) &&
+        isInUnits(Range.Low) && isInUnits(Range.High) && isInUnits(Step))
+        Range.Step = Step;
+}
+
+ValueRange cutRange(const ValueRange& Range, double Low, double High) {
+    ValueRange Cut = Range;
+    if (Range.isEmpty())
+        return Cut;
+    if (Low > Range.Low)
+        Cut.Low = alignUp(Range, Low);
+    if (High < Range.High)
+        Cut.High = alignDown(Range, High);
+    if (Cut.Low > Cut.High) {
+        Cut = emptyRange();
+        Cut.MayBeNaN = Range.MayBeNaN;
+        Cut.MayBeNegativeZero = Range.MayBeNegativeZero;
+    }
+    return Cut;
+}
+
+Residues residuesOf(std::int64_t First, std::uint64_t Width, std::int64_t Step,
+                    std::int64_t Period) {
+    constexpr std::uint64_t Few = 32;
+    const auto Modulus = static_cast<std::uint64_t>(Period);
+    const auto Begin = static_cast<std::uint64_t>((First % Period + Period) % Period);
+    if (Width < Modulus && Begin + Width < Modulus)
+        return {static_cast<std::int64_t>(Begin), static_cast<std::int64_t>(Begin + Width)};
+    const auto Gap = static_cast<std::uint64_t>(Step);
+    if (Width / Gap < Few) {
+        std::uint64_t Low = Begin;
+        std::uint64_t High = Begin;
+        for (std::uint64_t i = 1; i <= Width / Gap; ++i) {
+            const std::uint64_t Next = (Begin + i * Gap % Modulus) % Modulus;
+            Low = std::min(Low, Next);
+            High = std::max(High, Next);
+        }
+        return {static_cast<std::int64_t>(Low), static_cast<std::int64_t>(High)};
+    }
+    // A border is crossed, so both ends of what the common step leaves are met if it divides the
+    // period.
+    const std::uint64_t Common = std::gcd(Gap, Modulus);
+    const std::uint64_t Low = Begin % Common;
+    return {static_cast<std::int64_t>(Low),
+            static_cast<std::int64_t>(Low + (Modulus - 1 - Low) / Common * Common)};
 }
 
 ValueRange rangeOfUnary(Operator Op, const ValueRange& Operand) {

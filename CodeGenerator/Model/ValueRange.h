@@ -3,6 +3,8 @@
 
 #include "Language/Program.h"
 
+#include <cstdint>
+
 namespace hpn {
 
 /// What is known of a number at run time without knowing the number: the closed interval of the
@@ -16,6 +18,12 @@ struct ValueRange {
     bool MayBeNegativeZero = false;
     bool IsIntegral = false; ///< every number in it is a whole number (or it is empty); never true
                              ///< with infinite ends
+    /// More than 0: every number in it, and High, is Low plus a whole multiple of this, exactly.
+    /// Kept for the grids of scaled types only; whole numbers without a gap have 0 here.
+    double Step = 0.0;
+    /// More than 0: no number in it but the zeros is nearer to zero. For grids that double
+    /// arithmetic does not hit exactly.
+    double Least = 0.0;
 
     bool isEmpty() const { return Low > High; }
     /// One number and nothing else: not a NaN, and of one sign if it is zero.
@@ -29,6 +37,20 @@ struct ValueRange {
 ValueRange rangeOfNumber(double Number);
 /// Every double there is.
 ValueRange rangeOfAnything();
+/// Gives a range between finite ends the grid of a step from its lower end, if all of its numbers
+/// are so few and so coarse that sums of them are exact; else nothing changes.
+void setStep(ValueRange& Range, double Step);
+/// What of a range lies between two numbers, its ends on its grid; empty if nothing does. Negative
+/// zeros and NaNs stay flagged.
+ValueRange cutRange(const ValueRange& Range, double Low, double High);
+/// The ends of what is left of First, First + Step, ... up to First + Width modulo Period (at most
+/// 2^32). Exact for few numbers, and where nothing but the order of the periods is lost.
+struct Residues {
+    std::int64_t Low;
+    std::int64_t High;
+};
+Residues residuesOf(std::int64_t First, std::uint64_t Width, std::int64_t Step,
+                    std::int64_t Period);
 /// Smallest range that holds both.
 ValueRange hull(const ValueRange& a, const ValueRange& b);
 

@@ -1,6 +1,7 @@
 #include "ZfCScaleTool.h"
 
 #include "ZF_Scaling.h"
+#include "ZfCLinearScaling.h" // has no source of its own, and a DLL holds only what a source sees
 
 #include <cmath>
 

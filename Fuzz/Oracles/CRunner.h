@@ -1,8 +1,8 @@
 #ifndef CRUNNER_H
 #define CRUNNER_H
 
-#include <cstdio>
-#include <cstdlib>
+#include "Oracles/HostShell.h"
+
 #include <filesystem>
 #include <fstream>
 #include <string>
@@ -11,10 +11,7 @@
 /// object unless something failed, so that the text can be looked at.
 class CRunner {
 public:
-    CRunner() {
-        std::string Pattern = (std::filesystem::temp_directory_path() / "hpn-test-XXXXXX").string();
-        m_Directory = ::mkdtemp(Pattern.data());
-    }
+    CRunner() : m_Directory(hostshell::makeDirectory("hpn-test")) {}
     ~CRunner() {
         if (!m_Failed)
             std::filesystem::remove_all(m_Directory);
@@ -30,19 +27,20 @@ public:
     /// well.
     std::string compile(const std::string& Name, const std::string& Options,
                         const std::string& Compiler = "gcc") {
-        const std::string Command = "cd " + m_Directory.string() + " && " + Compiler +
+        const std::string Command = "cd " + m_Directory.generic_string() + " && " + Compiler +
                                     " -std=c99 -Wall -Wextra -Werror -I" HPNSSA_SOURCE_DIR
                                     "/CodeGenerator/Runtime " +
                                     Options + " " + Name + ".c -o " + Name + " 2>&1";
         int Status = 0;
-        std::string Messages = capture(Command, Status);
+        std::string Messages = hostshell::run(Command, Status);
         m_Failed = m_Failed || Status != 0;
         return Status == 0 ? std::string() : Command + "\n" + Messages;
     }
     /// What the program prints; a failure of it is the last line.
     std::string run(const std::string& Name) {
         int Status = 0;
-        std::string Output = capture((m_Directory / Name).string() + " 2>&1", Status);
+        std::string Output =
+            hostshell::run((m_Directory / Name).generic_string() + " 2>&1", Status);
         if (Status != 0) {
             m_Failed = true;
             Output += "status " + std::to_string(Status) + "\n";
@@ -52,16 +50,6 @@ public:
     void keep() { m_Failed = true; }
 
 private:
-    static std::string capture(const std::string& Command, int& Status) {
-        std::string Output;
-        std::FILE* pPipe = ::popen(Command.c_str(), "r");
-        char Buffer[4096];
-        while (const std::size_t Count = std::fread(Buffer, 1, sizeof Buffer, pPipe))
-            Output.append(Buffer, Count);
-        Status = ::pclose(pPipe);
-        return Output;
-    }
-
     std::filesystem::path m_Directory;
     bool m_Failed = false;
 };

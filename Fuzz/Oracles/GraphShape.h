@@ -3,6 +3,7 @@
 
 #include "Graph/ProgramGraph.h"
 
+#include <algorithm>
 #include <set>
 #include <string>
 #include <vector>
@@ -64,6 +65,49 @@ inline std::string nodeFaults(ZfCControlFlowGraph& Graph, leda::node v) {
             (pBlock->isStatement() != pStatement || Graph.outdeg(v) > 1))
             Faults += "a call does not stand alone in its block, or the block branches\n";
     return Faults + waysOutFaults(Graph, v, pBlock);
+}
+
+/// What holds of the control flow between any two passes, whatever they have removed; empty, or
+/// what is wrong. Edges stay in one procedure; a branch has one way for each outcome at the most,
+/// and at least one; other nodes have one way on, the last ones none; every node but an exit that
+/// has lost its last way in is reached from an entry. Edges of the SSA graph do not count.
+inline std::string flowFaults(ZfCControlFlowGraph& Graph) {
+    std::string Faults;
+    std::vector<leda::node> WorkList;
+    std::vector<bool> Reached(static_cast<std::size_t>(Graph.max_node_index()) + 1, false);
+    const auto mark = [&](leda::node v) {
+        if (!Reached[static_cast<std::size_t>(Graph.index(v))])
+            WorkList.push_back(v);
+        Reached[static_cast<std::size_t>(Graph.index(v))] = true;
+    };
+    for (leda::node v = Graph.first_node(); v != nullptr; v = Graph.next_node(v))
+        if (Graph.inf(v)->isEntryNode() != nullptr)
+            mark(v);
+    while (!WorkList.empty()) {
+        const leda::node v = WorkList.back();
+        WorkList.pop_back();
+        int Ways[3] = {0, 0, 0}; // plain, true, false
+        for (leda::edge e = Graph.first_adj_edge(v); e != nullptr; e = Graph.adj_succ(e)) {
+            if (Graph.inf(e)->isSSAEdge() != nullptr)
+                continue;
+            mark(Graph.target(e));
+            ++Ways[Graph.inf(e)->isTrueBranch() != nullptr    ? 1
+                   : Graph.inf(e)->isFalseBranch() != nullptr ? 2
+                                                              : 0];
+            if (Graph.inf(Graph.target(e))->getProcedure() != Graph.inf(v)->getProcedure())
+                Faults += "an edge leads to another procedure\n";
+        }
+        ZfCBasicBlock* pBlock = Graph.inf(v)->isBasicBlock();
+        const bool Branches = pBlock != nullptr && pBlock->getBranchCond() != nullptr;
+        if (Branches ? Ways[0] != 0 || std::max(Ways[1], Ways[2]) != 1
+                     : Ways[0] + Ways[1] + Ways[2] > 1)
+            Faults += "the ways out of a node do not fit its condition\n";
+    }
+    for (leda::node v = Graph.first_node(); v != nullptr; v = Graph.next_node(v))
+        if (!Reached[static_cast<std::size_t>(Graph.index(v))] &&
+            (Graph.inf(v)->isExitNode() == nullptr || Graph.indeg(v) != 0))
+            Faults += "a node is reached from no entry\n";
+    return Faults;
 }
 
 /// All that later passes rely on; empty, or what is wrong. The ways of a branch never lead to the

@@ -10,7 +10,9 @@
 //    defined twice.
 // 2. What is used is a version, and its definition dominates the use. An argument is used at its
 // call; the expression of
-//    a value return statement is used at the callee's exit, if control gets there.
+//    a value return statement is used at the callee's exit. Where control does not get there,
+//    because the callee is never left, nothing is given back, and the definition may be gone with
+//    the code.
 // 3. A phi function has an operand for each control flow in-edge of its join, and the definition of
 // operand i dominates
 //    the source of in-edge i. In a divided graph, the join is the node at the head of the chain of
@@ -24,15 +26,21 @@
 #include <climits>
 #include <map>
 #include <string>
+#include <unordered_map>
 #include <vector>
 
 #include "ZfCControlFlowGraph.h"
 
 namespace passes {
 
+// Once statements have moved out of the arms of branches, one stands for its twin as well, whose
+// version is used without a definition: no dominance is asked for then.
+enum class Strictness { Full, WithoutDominance };
+
 class SSAVerifier {
 public:
-    explicit SSAVerifier(ZfCControlFlowGraph& Graph) : m_Graph(Graph) {
+    explicit SSAVerifier(ZfCControlFlowGraph& Graph, Strictness Asked = Strictness::Full)
+        : m_Graph(Graph), m_Asked(Asked) {
         computeDominators();
         collectDefinitions();
         for (leda::node v : m_Reached)
@@ -83,9 +91,11 @@ private:
             Changed = false;
             for (leda::node v : m_Reached) {
                 leda::node Idom = nullptr;
-                for (leda::edge e : inEdges(v)) {
+                for (leda::edge e = m_Graph.first_in_edge(v); e != nullptr;
+                     e = m_Graph.in_succ(e)) {
                     leda::node u = m_Graph.source(e);
-                    if (isReached(u) && (m_Idom[index(u)] != nullptr || isEntry(u)))
+                    if (isControlFlow(e) && isReached(u) &&
+                        (m_Idom[index(u)] != nullptr || isEntry(u)))
                         Idom = Idom == nullptr ? u : meet(Idom, u);
                 }
                 Changed = Changed || m_Idom[index(v)] != Idom;
@@ -121,8 +131,12 @@ private:
     }
 
     void collectDefinitions() {
+        m_Definitions.reserve(std::size_t(m_Graph.number_of_nodes()));
         for (leda::node v = m_Graph.first_node(); v != nullptr; v = m_Graph.next_node(v)) {
             ZfCBasicBlock* pBlock = m_Graph.inf(v)->isBasicBlock();
+            if (isEntry(v))
+                m_Procedures[m_Graph.inf(v)->getProcedure()->getName().cstring()] =
+                    m_Graph.inf(v)->getProcedure();
             if (pBlock == nullptr)
                 continue;
             for (ZfCPhiFunction* pPhi : pBlock->getPhiFunctions())
@@ -150,10 +164,11 @@ private:
 
     bool isDefinedBefore(ZfCCfgVariable* pVar, Place Use, char const* pWhat) {
         auto Found = m_Definitions.find(pVar);
+        bool IsVersion = pVar != nullptr && pVar->isSSAVariable() != nullptr;
+        if (m_Asked == Strictness::WithoutDominance && IsVersion)
+            return true;
         if (Found == m_Definitions.end()) {
-            report(std::string(pWhat) + (pVar != nullptr && pVar->isSSAVariable() != nullptr
-                                             ? " has no definition"
-                                             : " is no version"),
+            report(std::string(pWhat) + (IsVersion ? " has no definition" : " is no version"),
                    Use.v);
             return false;
         }
@@ -203,13 +218,33 @@ private:
     }
     void checkReturned(ZfCCfgVariable* pVar, Place At) {
         auto Found = m_Definitions.find(pVar);
-        if (Found == m_Definitions.end()) {
-            report("a returned value has no definition", At.v);
-            return;
-        }
-        leda::node Exit = m_Graph.inf(Found->second.v)->getProcedure()->getExitNode();
-        if (isReached(Exit))
+        ZfCCfgProcedure* pCallee = Found != m_Definitions.end()
+                                       ? m_Graph.inf(Found->second.v)->getProcedure()
+                                       : calleeBefore(At);
+        leda::node Exit = pCallee != nullptr ? pCallee->getExitNode() : nullptr;
+        if (Exit == nullptr)
+            report("a value is returned behind no call", At.v);
+        else if (isReached(Exit))
             isDefinedBefore(pVar, {Exit, 0}, "a returned value");
+    }
+    // Of the call that a value return statement belongs to: the last one before it on the only way
+    // there.
+    ZfCCfgProcedure* calleeBefore(Place At) {
+        for (int Steps = m_Graph.number_of_nodes(); Steps > 0; --Steps) {
+            ZfCCfgProcedureCall* pCall = nullptr;
+            int Position = 0;
+            if (ZfCBasicBlock* pBlock = m_Graph.inf(At.v)->isBasicBlock())
+                for (ZfCCfgStatement* pStmt : pBlock->getStatementSeq())
+                    if (Position++ < At.Position && pStmt->isProcedureCall() != nullptr)
+                        pCall = pStmt->isProcedureCall();
+            if (pCall != nullptr)
+                return m_Procedures[pCall->getName().cstring()];
+            std::vector<leda::edge> Edges = inEdges(At.v);
+            if (Edges.size() != 1)
+                break;
+            At = {m_Graph.source(Edges[0]), INT_MAX};
+        }
+        return nullptr;
     }
 
     // Up the chain of phi functions to the node with the in-edges of the join.
@@ -246,16 +281,18 @@ private:
     }
 
     ZfCControlFlowGraph& m_Graph;
+    Strictness m_Asked;
     std::vector<int> m_Number;
     std::vector<leda::node> m_Idom;
-    std::vector<leda::node> m_Reached; // in reverse postorder
-    std::map<ZfCCfgVariable*, Place> m_Definitions;
-    std::map<ZfCCfgProcedureCall*, Place> m_Calls;
+    std::vector<leda::node> m_Reached;                        // in reverse postorder
+    std::unordered_map<ZfCCfgVariable*, Place> m_Definitions; // looked up only, as the next
+    std::unordered_map<ZfCCfgProcedureCall*, Place> m_Calls;
+    std::map<std::string, ZfCCfgProcedure*> m_Procedures;
     std::string m_Violations;
 };
 
-inline std::string verifySSA(ZfCControlFlowGraph& Graph) {
-    return SSAVerifier(Graph).violations();
+inline std::string verifySSA(ZfCControlFlowGraph& Graph, Strictness Asked = Strictness::Full) {
+    return SSAVerifier(Graph, Asked).violations();
 }
 
 } // namespace passes

@@ -36,7 +36,8 @@ struct Case {
 /// One operator on one domain, its results as they are or stored in one type.
 struct Finding {
     std::string Name;         ///< operator as written in the language
-    const Domain* pDomain;    ///< of both operands
+    const Domain* pDomain;    ///< of the left or only operand
+    const Domain* pRight;     ///< of the right operand
     const Store* pStore;      ///< null: the operator's result itself
     std::uint64_t Cases = 0;  ///< intervals, or pairs of intervals
     std::uint64_t Narrow = 0; ///< too narrow: a fault
@@ -53,8 +54,10 @@ const std::vector<Store>& stores();
 /// arithmetic. In order of domain, operator, store. Takes seconds.
 std::vector<Finding> proveRanges(bool KeepAllCases);
 
-/// The findings by operator and domain, with how many are not as narrow as possible and the first
-/// of them; stores follow in a table of their own. Two runs give identical text.
+/// Operator, domain, store and counts of one finding, without the line's end.
+std::string describe(const Finding& Of);
+/// A table of all findings that are not exact throughout, with the first case of each, between
+/// figures for all of them. Two runs give identical text.
 std::string printTable(const std::vector<Finding>& Findings);
 /// Every case that is not as narrow as possible.
 std::string printWideCases(const std::vector<Finding>& Findings);

@@ -343,6 +343,7 @@ private:
         const int Omitted = m_Choices.pick(256);
         const auto wants = [Omitted](int Bit) { return (Omitted >> Bit & 1) == 0; };
         graph().placeExitNodes();
+        joinExits();
         const bool Inlines = wants(0);
         if (!Inlines)
             m_P.registerCalls();
@@ -369,6 +370,19 @@ private:
         }
         graph().hoistCodeOutOfIfElseBranches();
         judge("hoisting", true);
+    }
+    /// Returned values are renamed along the first way into an exit node; a second one would find
+    /// versions already, so there is only one.
+    void joinExits() {
+        for (leda::node v : leda::list<leda::node>(graph().all_nodes())) {
+            if (graph().inf(v)->isExitNode() == nullptr || graph().indeg(v) < 2)
+                continue;
+            const leda::node Last = m_P.block();
+            m_P.blockOf(Last)->setProcedure(graph().inf(v)->getProcedure());
+            for (leda::edge e : leda::list<leda::edge>(graph().in_edges(v)))
+                graph().move_edge(e, graph().source(e), Last);
+            m_P.edge(Last, v);
+        }
     }
     template <class Wants>
     void propagate(const Wants& wants) {

@@ -82,10 +82,12 @@ TEST(Driver, ReplacesTheOutputWholeAndLeavesNothingElseBehind) {
     DriverRun Run;
     Run.write("small.hpn", Small);
     Run.write("real.c", "old");
-    std::filesystem::create_symlink("real.c", Run.directory() + "/link.c");
-    ASSERT_EQ(Run.run("small.hpn -o link.c"), 0) << Run.errors();
+    std::error_code NoLinks; // not every system lets everyone make them
+    std::filesystem::create_symlink("real.c", Run.directory() + "/link.c", NoLinks);
+    const std::string Target = NoLinks ? "real.c" : "link.c";
+    ASSERT_EQ(Run.run("small.hpn -o " + Target), 0) << Run.errors();
     EXPECT_TRUE(contains(Run.read("real.c"), "small_step"));
-    EXPECT_TRUE(std::filesystem::is_symlink(Run.directory() + "/link.c"));
+    EXPECT_TRUE(NoLinks || std::filesystem::is_symlink(Run.directory() + "/link.c"));
     for (const auto& [Name, Text] : Run.files())
         EXPECT_FALSE(contains(Name, ".tmp")) << Name;
 }
@@ -108,7 +110,7 @@ TEST(Driver, StandardInputAndOutputCarryTheSameProgramAsFiles) {
     const std::string Compile = "cd " + Run.directory() +
                                 "/alone && gcc -std=c99 -Wall -Wextra "
                                 "-Werror -O2 -c small.c";
-    EXPECT_EQ(std::system(Compile.c_str()), 0);
+    EXPECT_EQ(hostshell::status(Compile), 0);
 }
 
 TEST(Driver, ReportsGoBesideTheCodeAndNotIntoIt) {
@@ -185,7 +187,7 @@ TEST(Driver, RunsUnderDifferentAddressesGiveIdenticalBytes) {
         "", "env PADDING=$(head -c 40000 /dev/zero | tr '\\0' x)",
         "env MALLOC_ARENA_MAX=1 MALLOC_MMAP_THRESHOLD_=64 MALLOC_PERTURB_=85"};
     // Not allowed in every container.
-    if (std::system("setarch -R true 2>/dev/null") == 0)
+    if (hostshell::status("setarch -R true 2>/dev/null") == 0)
         Surroundings.push_back("setarch -R");
     std::map<std::string, std::string> First;
     for (const char* Before : Surroundings) {
@@ -245,20 +247,26 @@ TEST(Driver, CruiseControlLosesTheOptionThatThisVehicleLacks) {
     EXPECT_TRUE(contains(Run.output(), "HAS_RESUME"));
 }
 
-// The first two C blocks of the README, before and after, are what the tool gives for its first
-// program text.
+// The C before and after that the README shows is what the tool gives for the program above it.
 TEST(Driver, ReadmeShowsWhatTheToolGives) {
     const std::string Readme = DriverRun::readFile(HPNSSA_SOURCE_DIR "/README.md");
-    const auto blockOf = [&Readme](const std::string& Opening) {
-        const std::size_t Begin = Readme.find(Opening) + Opening.size();
-        return Readme.substr(Begin, Readme.find("```", Begin) - Begin);
+    std::size_t At = 0;
+    const auto blockOf = [&](const std::string& Opening, const std::string& Closing) {
+        const std::size_t Begin = Readme.find(Opening, At) + Opening.size();
+        At = Readme.find(Closing, Begin);
+        std::string Text = Readme.substr(Begin, At - Begin);
+        for (std::size_t Break = 0; (Break = Text.find("<br>")) != std::string::npos;)
+            Text.replace(Break, 4, "\n");
+        return Text;
     };
     DriverRun Run;
-    Run.write("heater.hpn", blockOf("```text\n"));
-    ASSERT_EQ(Run.run("heater.hpn"), 0) << Run.errors();
-    const std::string Shown = blockOf("```c\n");
-    ASSERT_FALSE(Shown.empty());
-    EXPECT_TRUE(contains(Run.output(), Shown)) << Run.output();
+    Run.write("option.hpn", blockOf("```text\n", "```"));
+    for (const char* Options : {"option.hpn --no-optimize", "option.hpn"}) {
+        const std::string Shown = blockOf("<pre>", "</pre>");
+        ASSERT_TRUE(contains(Shown, "void option_step(void)")) << Shown;
+        ASSERT_EQ(Run.run(Options), 0) << Run.errors();
+        EXPECT_TRUE(contains(Run.output(), Shown)) << Run.output();
+    }
 }
 
 } // namespace

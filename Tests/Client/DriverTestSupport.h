@@ -1,22 +1,17 @@
 #ifndef DRIVERTESTSUPPORT_H
 #define DRIVERTESTSUPPORT_H
 
-#include <cstdlib>
+#include "Oracles/HostShell.h"
+
 #include <filesystem>
 #include <fstream>
-#include <iterator>
 #include <map>
 #include <string>
-#include <sys/wait.h>
-#include <unistd.h>
 
 /// Runs the built driver in a directory of its own, which goes with the object.
 class DriverRun {
 public:
-    DriverRun() {
-        char Template[] = "/tmp/hpncg-test-XXXXXX";
-        m_Directory = mkdtemp(Template);
-    }
+    DriverRun() : m_Directory(hostshell::makeDirectory("hpncg-test")) {}
     ~DriverRun() {
         std::error_code Ignored;
         std::filesystem::remove_all(m_Directory, Ignored);
@@ -27,10 +22,8 @@ public:
     /// Exit status of `hpncg ARGUMENTS` in the directory, through a shell; `Before` stands in front
     /// of the command.
     int run(const std::string& Arguments, const std::string& Before = "") {
-        const std::string Command = "cd " + m_Directory + " && " + Before + " " + driver() + " " +
-                                    Arguments + " >stdout 2>stderr";
-        const int Status = std::system(Command.c_str());
-        return WIFEXITED(Status) ? WEXITSTATUS(Status) : -1;
+        return hostshell::status("cd " + m_Directory + " && " + Before + " " + driver() + " " +
+                                 Arguments + " >stdout 2>stderr");
     }
     std::string output() const { return read("stdout"); }
     std::string errors() const { return read("stderr"); }
@@ -47,18 +40,21 @@ public:
         const std::filesystem::path Root = std::filesystem::path(m_Directory) / Name;
         for (const auto& Entry : std::filesystem::recursive_directory_iterator(Root))
             if (Entry.is_regular_file())
-                Result[Entry.path().lexically_relative(Root).string()] = readFile(Entry.path());
+                Result[Entry.path().lexically_relative(Root).generic_string()] =
+                    readFile(Entry.path());
         return Result;
     }
 
     static std::string readFile(const std::filesystem::path& Path) {
-        std::ifstream Stream(Path, std::ios::binary);
-        return {std::istreambuf_iterator<char>(Stream), {}};
+        return hostshell::readFile(Path);
     }
     /// The driver of the same build as this test.
     static std::string driver() {
-        const std::filesystem::path Self = std::filesystem::read_symlink("/proc/self/exe");
-        return (Self.parent_path().parent_path() / "CodeGenerator" / "hpncg").string();
+#ifdef _WIN32
+        return "run-windows-program " HPNCG_PATH;
+#else
+        return HPNCG_PATH;
+#endif
     }
 
 private:

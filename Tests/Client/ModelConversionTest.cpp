@@ -134,24 +134,27 @@ ValueRange makeRange(double Low, double High, bool IsIntegral, bool MayBeNaN) {
     return Range;
 }
 
-// All quarters of a random interval are converted; with a step of a quarter every raw number of the
-// types in between is met.
+// Every number of a random interval on a grid is converted, also of grids that the type lacks.
 TEST(ModelConversion, RangesHoldAllNumbersAndAreExactForNearlyAllIntervals) {
     std::mt19937 Random(7);
+    const double Steps[] = {0.25, 0.5, 1.0, 2.0, 3.0};
     int Exact = 0;
     int Total = 0;
     for (const Type& To : makeTypes()) {
         for (int i = 0; i < 300; ++i, ++Total) {
-            const bool IsIntegral = i % 2 == 0;
-            const int Width = static_cast<int>(Random() % 300);
+            const double Step = Steps[i % 5];
+            const int Count = static_cast<int>(Random() % 300);
             const double Low = static_cast<int>(Random() % 1400) - 700;
-            const ValueRange From = makeRange(Low, Low + Width, IsIntegral, i % 5 == 0);
+            ValueRange From = makeRange(Low, Low + Count * Step, Step >= 1.0, i % 7 == 0);
+            From.Step = 0.0;
+            setStep(From, Step);
             const ValueRange Converted = convertRange(From, To);
             ValueRange Seen = rangeOfNumber(convertNumber(Low, To));
-            for (double Number = Low; Number <= Low + Width; Number += IsIntegral ? 1.0 : 0.25) {
-                ASSERT_TRUE(Converted.contains(convertNumber(Number, To)))
-                    << static_cast<int>(To.Base) << ": " << Number;
-                Seen = hull(Seen, rangeOfNumber(convertNumber(Number, To)));
+            for (int n = 0; n <= Count; ++n) {
+                const double Number = convertNumber(Low + n * Step, To);
+                ASSERT_TRUE(Converted.contains(Number))
+                    << static_cast<int>(To.Base) << ": " << Low + n * Step;
+                Seen = hull(Seen, rangeOfNumber(Number));
             }
             if (From.MayBeNaN) {
                 ASSERT_TRUE(Converted.contains(convertNumber(std::nan(""), To)));

@@ -8,8 +8,10 @@
 
 #include <gtest/gtest.h>
 
+#include <fstream>
 #include <limits>
 #include <random>
+#include <sstream>
 #include <vector>
 
 namespace {
@@ -50,22 +52,45 @@ struct Tally {
     }
 };
 
-// All intervals and pairs of intervals of domains of sixteen numbers, by exact arithmetic.
+// All intervals and pairs of intervals of types of sixteen numbers, judged by exact arithmetic. The
+// operators are as narrow as intervals can be; what is lost between an operator and a store behind
+// it is counted in the table, which hpnranges prints.
 TEST(ModelRange, SmallDomainsAreProved) {
-    for (const proof::Finding& Next : proof::proveRanges(false)) {
-        EXPECT_EQ(Next.Narrow, 0U) << Next.Name << " on " << Next.pDomain->Name;
-        if (Next.pStore == nullptr && Next.pDomain->Name == "signed") {
-            EXPECT_GE(Next.Exact * 100, Next.Cases * 95) << Next.Name;
+    const std::vector<proof::Finding> Findings = proof::proveRanges(false);
+    for (const proof::Finding& Next : Findings) {
+        EXPECT_EQ(Next.Narrow, 0U) << proof::describe(Next);
+        if (Next.pStore == nullptr && Next.pRight == Next.pDomain) {
+            EXPECT_GE(Next.Exact * 100, Next.Cases * 95) << proof::describe(Next);
         }
     }
+    std::ostringstream Kept;
+    Kept << std::ifstream(HPNSSA_SOURCE_DIR "/Documentation/Ranges.txt").rdbuf();
+    EXPECT_EQ(proof::printTable(Findings), Kept.str()) << "hpnranges > Documentation/Ranges.txt";
 }
 
-// Bit operators and shifts where the sign bit and the window of 32 bits matter: blocks of numbers
-// around the borders.
+// Numbers on a grid, next to each other or with gaps.
+struct Row {
+    ValueRange Range;
+    std::vector<double> Numbers;
+};
+
+Row makeRow(double Low, double Step, int Count) {
+    Row Made;
+    for (int i = 0; i < Count; ++i)
+        Made.Numbers.push_back(Low + i * Step);
+    Made.Range = hull(rangeOfNumber(Low), rangeOfNumber(Made.Numbers.back()));
+    Made.Range.Step = 0.0; // two numbers know that there is none between them
+    setStep(Made.Range, Step);
+    return Made;
+}
+
+// Bit operators and shifts where the sign bit and the window of 32 bits matter: numbers around the
+// borders, up to more than are looked at one by one.
 TEST(ModelRange, IntegerOperatorsAtTheBordersOf32Bits) {
     std::mt19937 Random(11);
     const double Borders[] = {-2147483648.0, -1073741824.0, -65536.0,     0.0,
                               65536.0,       1073741824.0,  2147483640.0, 2147483648.0};
+    const double Steps[] = {1.0, 1.0, 2.0, 3.0, 4.0, 16.0};
     for (const Operator Op : {Operator::BitAnd, Operator::BitOr, Operator::BitXor,
                               Operator::ShiftLeft, Operator::ShiftRight, Operator::Modulo}) {
         Tally Result;
@@ -73,20 +98,18 @@ TEST(ModelRange, IntegerOperatorsAtTheBordersOf32Bits) {
             const double a = Borders[Random() % 8] + static_cast<int>(Random() % 24) - 12;
             const double c = (Random() % 2 != 0 ? Borders[Random() % 8] : 0.0) +
                              static_cast<int>(Random() % 40) - 8;
-            const double b = a + Random() % 12;
-            const double d = c + Random() % 12;
-            ValueRange Left = hull(rangeOfNumber(a), rangeOfNumber(b));
-            ValueRange Right = hull(rangeOfNumber(c), rangeOfNumber(d));
+            const Row Left = makeRow(a, Steps[Random() % 6], 1 + static_cast<int>(Random() % 48));
+            const Row Right = makeRow(c, Steps[Random() % 6], 1 + static_cast<int>(Random() % 12));
             std::vector<double> Seen;
-            for (double x = a; x <= b; ++x) {
-                for (double y = c; y <= d; ++y)
+            for (const double x : Left.Numbers) {
+                for (const double y : Right.Numbers)
                     Seen.push_back(computeBinary(Op, x, y));
             }
-            Result.add(rangeOfBinary(Op, Left, Right), Seen);
+            Result.add(rangeOfBinary(Op, Left.Range, Right.Range), Seen);
             if (HasFatalFailure())
                 return;
         }
-        EXPECT_GE(Result.Exact * 100, Result.Total * 95)
+        EXPECT_GE(Result.Exact * 100, Result.Total * 85)
             << static_cast<int>(Op) << ": " << Result.Exact;
     }
 }

@@ -113,10 +113,6 @@ TEST(ReaderMessages, StatementsThatHoldOthers) {
          "2:1: error: expected '}' before 'proc'\n3:1: error: expected a declaration before '}'\n"},
         {"s = 1; } }", "2:10: error: expected a declaration before '}'\n"},
         {"{ s = 1;", "4:1: error: expected '}' before the end of the file\n"},
-        {"if s { }", "2:4: error: expected '(' before 's'\n"},
-        {"if s { }", "2:4: error: expected '(' before 's'\n"},
-        {"if s s = 1;", "2:4: error: expected '(' before 's'\n"},
-        {"state uint8 inner; s = 1;", "2:1: error: expected '}' before 'state'\n"},
     };
     expectInMain(Mistakes);
 }

@@ -8,6 +8,7 @@ using namespace hpn::fuzz;
 // A run of fixed seeds: every program reads, and no pass changes what it does.
 TEST(FuzzRun, FixedSeedsStandUp) {
     FuzzOptions Options;
+    Options.PairsEvery = 2;
     TrialCounts Sum;
     for (std::uint64_t Seed = 1; Seed <= 200; ++Seed) {
         const TrialResult Result = runTrial(makeTrial(Seed, Options));
@@ -19,6 +20,8 @@ TEST(FuzzRun, FixedSeedsStandUp) {
         Sum.Exhausted += Result.Counts.Exhausted;
         for (std::size_t i = 0; i < PassCount; ++i)
             Sum.Passes[i] += Result.Counts.Passes[i];
+        for (std::size_t i = 0; i < PairKindCount; ++i)
+            Sum.Pairs[i] += Result.Counts.Pairs[i];
     }
     // The programs give the passes something to do, and nearly all of them end.
     EXPECT_GT(Sum.Constants, 2000u);
@@ -26,6 +29,8 @@ TEST(FuzzRun, FixedSeedsStandUp) {
     EXPECT_LT(Sum.Exhausted, 20u);
     for (std::size_t i = 0; i < PassCount; ++i)
         EXPECT_GT(Sum.Passes[i], 10u) << passTable()[i].Name;
+    for (std::size_t i = 1; i < PairKindCount; ++i)
+        EXPECT_GT(Sum.Pairs[i], 5u) << nameOfPair(static_cast<PairKind>(i));
 }
 
 TEST(FuzzRun, SameSeedSameProgram) {

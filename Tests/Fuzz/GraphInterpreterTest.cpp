@@ -1,6 +1,7 @@
 #include "FuzzTestSupport.h"
 
 #include "CodeHarness.h"
+#include "Oracles/HostShell.h"
 
 #include <filesystem>
 #include <gtest/gtest.h>
@@ -87,8 +88,8 @@ TEST(GraphInterpreter, AgreesWithTheCompilerOnEmittedCode) {
         ASSERT_EQ("", Result.Failed.Kind) << Each.Name << ": " << Result.Failed.Detail;
         Batch.add(Each.Name, std::move(Result.Code));
     }
-    std::string Directory = (std::filesystem::temp_directory_path() / "hpn-fuzz-XXXXXX").string();
-    ASSERT_NE(nullptr, ::mkdtemp(Directory.data()));
+    const std::string Directory = hostshell::makeDirectory("hpn-fuzz");
+    ASSERT_NE("", Directory);
     EXPECT_EQ("", Batch.run(Directory, HPNSSA_SOURCE_DIR "/CodeGenerator/Runtime"));
 
     // And the comparison notices a variant that does something else.

@@ -1,5 +1,7 @@
 #include "FuzzTestSupport.h"
 
+#include "Metamorph.h"
+
 #include "Model/ZfCCfgSFExpression.h"
 #include "Shrinker.h"
 #include "ZfCBasicBlock.h"
@@ -159,6 +161,66 @@ TEST(Oracle, SeesWhatTheLibraryReports) {
                   Graph.getGraph().splitAtStatement(Graph.getGraph().getStartNode(), nullptr);
                   return true;
               }).substr(0, 14));
+}
+
+// ---- pairs ----
+
+bool isDeclared(ProgramGraph& Graph, std::string_view Name) {
+    const auto& All = Graph.getProgram().Variables;
+    return std::any_of(All.begin(), All.end(),
+                       [&](const Variable& Each) { return Each.Name == Name; });
+}
+
+/// Says something else of `shown` in one of the two programs than propagation has found, which
+/// is 4.
+std::string kindOfPair(PairKind Kind, ZfCCfgValue Said,
+                       const std::function<bool(ProgramGraph&)>& IsTheOther) {
+    Trial Wanted = trialOf(
+        "input uint8 on;\noutput uint8 shown = 0;\nstate uint8 kept = 4;\n"
+        "proc main() {\n  kept = 4;\n  if (OFF) {\n    kept = on;\n  }\n  shown = kept;\n}\n"
+        "param bool OFF = false;\n");
+    EXPECT_EQ("", runTrial(Wanted).Failed.Kind);
+    Wanted.Pair = Kind;
+    EXPECT_EQ("", runTrial(Wanted).Failed.Kind);
+    Wanted.Tamper = [&](std::string_view Pass, ProgramGraph& Graph) {
+        if (Pass != "propagateSparseConditionalConstant")
+            return;
+        forEachStatement(Graph, [&](ZfCBasicBlock*, ZfCCfgStatement* pStatement) {
+            ZfCCfgAssignment* pShown = assignmentTo(pStatement, "shown");
+            pShown = pShown != nullptr ? pShown : assignmentTo(pStatement, "znwohs_");
+            if (pShown != nullptr && IsTheOther(Graph))
+                pShown->getLHS()->setVarValueAndAdjustCfgValue(Said);
+            return pShown != nullptr;
+        });
+    };
+    const TrialResult Result = runTrial(Wanted);
+    EXPECT_EQ(1u, Result.Counts.Pairs[static_cast<std::size_t>(Kind)]);
+    return Result.Failed.Kind;
+}
+
+TEST(Oracle, SeesConclusionsThatHangOnNamesOrGrowWithTheInputs) {
+    EXPECT_EQ("pair renamed: claimed constant",
+              kindOfPair(PairKind::Renamed, ZfCCfgValue(0.0),
+                         [](ProgramGraph& Graph) { return !isDeclared(Graph, "kept"); }));
+    EXPECT_EQ(
+        "pair widened: shown ",
+        kindOfPair(PairKind::Widened, ZfCCfgValue(eCfgValueNonConstant), [](ProgramGraph& Graph) {
+            return Graph.getProgram().Variables.front().pType->Base == BaseType::UInt8;
+        }));
+}
+
+TEST(Oracle, OtherProgramsDoTheSame) {
+    for (const PairKind Kind :
+         {PairKind::Reordered, PairKind::DeadCode, PairKind::PassOff, PairKind::Twice}) {
+        Trial Wanted = trialOf(Program);
+        Wanted.Pair = Kind;
+        Trial Other;
+        ASSERT_TRUE(makeVariant(Wanted, Other)) << nameOfPair(Kind);
+        EXPECT_TRUE(Other.Text != Wanted.Text ||
+                    listPasses(Other.Passes) != listPasses(Wanted.Passes))
+            << nameOfPair(Kind);
+        EXPECT_EQ("", runTrial(Wanted).Failed.Kind) << nameOfPair(Kind);
+    }
 }
 
 // ---- shrinking ----

@@ -248,6 +248,9 @@ TEST(Set, BehavesAsTheStandardsAtEverySize) {
             }
             ASSERT_EQ(s.size(), int(model.size()));
             ASSERT_EQ(s.member(x), model.count(x) == 1);
+            if (step % 5 == 0 && s.size() < 100) { // also a copy of a set that shrank
+                ASSERT_EQ(elements(leda::set<int>(s)), vectorOf(model));
+            }
             if (step % (universe / 3) == 0) {
                 ASSERT_TRUE(s.check_consistency());
                 ASSERT_EQ(elements(s), vectorOf(model));
@@ -256,6 +259,12 @@ TEST(Set, BehavesAsTheStandardsAtEverySize) {
                 ASSERT_EQ(s.size() + 1, copy.size());
                 ASSERT_EQ(*copy.begin(), -1);
             }
+        }
+        for (; !model.empty(); model.erase(model.begin())) { // a large set that shrinks
+            if (model.size() < 100) {
+                ASSERT_EQ(elements(leda::set<int>(s)), vectorOf(model));
+            }
+            s.del(*model.begin());
         }
     }
 }
@@ -414,7 +423,9 @@ TEST(Dictionary, BehavesAsTheStandardsUnderRandomOperations) {
             ASSERT_EQ(d.lookup(key), items.count(key) ? items[key] : nullptr);
             if (step % (universe / 2) == 0) {
                 ASSERT_TRUE(d.check_consistency());
-                const leda::dictionary<int, int> copy(d);
+                leda::dictionary<int, int> copy;
+                copy.insert(-1, -1);
+                copy = d;
                 ASSERT_TRUE(copy.check_consistency());
                 std::vector<std::pair<int, int>> walked;
                 for (leda::dic_item it = copy.first_item(); it; it = copy.next_item(it))

@@ -143,9 +143,13 @@ TEST(MessageServer, DeliversToTheSinkAndCountsBySeverity) {
                   unsigned(counts[severity]));
 
     testing::internal::CaptureStderr();
+    for (int severity = 0; severity < 8; ++severity)
+        pServer->putMessage(tagERR_error_severity_etp(severity), 1, nullptr, "C", nullptr);
     pServer->putMessage(ERR_severity_error, 10015, &place, "General Messages",
                         "to the error stream");
     EXPECT_EQ(testing::internal::GetCapturedStderr(),
+              "info 1 (C): \nnotice 1 (C): \nerror 1 (C): \nfatal error 1 (C): \nmessage 1 (C): \n"
+              "message 1 (C): \nmessage 1 (C): \ninternal 1 (C): \n"
               "a.hpn:12:3: error 10015 (General Messages): to the error stream\n");
 }
 

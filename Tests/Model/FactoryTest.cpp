@@ -110,6 +110,7 @@ TEST_F(Factory, RecycledBlockIsCleanButRecycledEntryKeepsItsPast) {
     ZfCCfgProcedure* const pProcedure = factory().createProcedure();
     ZfCBasicBlock* const pBlock = factory().createBasicBlock();
     ZfCCfgEntry* const pEntry = factory().createEntryNode();
+    ZfCCfgExit* const pExit = factory().createExitNode();
     pBlock->append(new ZfCCfgInitAssignment);
     pBlock->append(new ZfCPhiFunction(nullptr, 0));
     pBlock->appendBranch(factory().createValueExpression());
@@ -121,16 +122,18 @@ TEST_F(Factory, RecycledBlockIsCleanButRecycledEntryKeepsItsPast) {
         pNodeInfo->getDF()->insert(v);
         factory().delNodeInfo(pNodeInfo);
     }
+    factory().delNodeInfo(pExit);
+    EXPECT_EQ(pExit, factory().createExitNode());
     EXPECT_EQ(1u, pEntry->getIndex());
     EXPECT_EQ(pBlock, factory().createBasicBlock());
     EXPECT_EQ(pEntry, factory().createEntryNode());
-    EXPECT_EQ(2u, pBlock->getIndex());
+    EXPECT_EQ(4u, pBlock->getIndex());
     EXPECT_TRUE(pBlock->isEmpty());
     EXPECT_TRUE(pBlock->getAssignedVariables().empty());
     EXPECT_EQ(nullptr, pBlock->getProcedure());
     EXPECT_EQ(nullptr, pBlock->getIdom());
     EXPECT_TRUE(pBlock->getDF()->empty());
-    EXPECT_EQ(3u, pEntry->getIndex());
+    EXPECT_EQ(5u, pEntry->getIndex());
     EXPECT_EQ(pProcedure, pEntry->getProcedure());
     EXPECT_EQ(v, pEntry->getIdom());
     EXPECT_TRUE(pEntry->getDF()->member(v));
@@ -151,10 +154,14 @@ TEST_F(Factory, RecycledVersionSortsByTheNumberOfItsFirstLife) {
     ZfCSSAVariable* const pOld = factory().createSSAVariable(&v);
     ZfCSSAVariable* const pYoung = factory().createSSAVariable(&v);
     pOld->markAsVolatile();
+    pOld->markAsErasable();
+    pOld->markAsArray();
     pOld->pushSSAReplacement(pYoung);
     pOld->appendVirtualAlias(pYoung);
     pOld->setMinValueAndDestroyOld(ZfCCfgValue(1.0));
     factory().delSSAVariable(pOld);
+    EXPECT_EQ(0u, pOld->getIndex());
+    EXPECT_FALSE(pOld->isErasable() || pOld->isArray() || pOld->isVolatile());
     EXPECT_EQ(nullptr, pOld->getOrigVar());
     EXPECT_EQ(nullptr, pOld->getNonVirtualAlias());
     EXPECT_EQ(pOld, factory().createSSAVariable(pYoung));
@@ -163,7 +170,8 @@ TEST_F(Factory, RecycledVersionSortsByTheNumberOfItsFirstLife) {
     EXPECT_EQ(&v, pOld->getOrigVar());
     EXPECT_EQ(pOld, pOld->getNonVirtualAlias());
     EXPECT_EQ(nullptr, pOld->topSSAReplacement());
-    EXPECT_FALSE(pOld->isVolatile());
+    EXPECT_FALSE(pOld->isVolatile() || pOld->isErasable() || pOld->isArray());
+    EXPECT_EQ(0, pOld->countAllUses());
     EXPECT_TRUE(pOld->getValue().isUndetermined());
     EXPECT_TRUE(pOld->getMinValue().isUndetermined());
     VariableSet Set;
@@ -220,6 +228,13 @@ TEST_F(Factory, ReleaseEndsClientExpressionsBeforeStatementsAndTheseInOrderOfCre
     factory().delLedaList_Node(factory().createLedaList_Node());
     factory().createLedaList_Node()->append(nullptr); // left to the release
     factory().delLedaList_Node(nullptr);
+    // What is parked when the factory empties goes too: the leak checker watches.
+    Variable v;
+    factory().delSSAVariable(factory().createSSAVariable(&v));
+    factory().delExplicitVarUse(factory().createExplicitVarUse());
+    factory().delEntryNode(factory().createEntryNode());
+    factory().delExitNode(factory().createExitNode());
+    factory().delProcedure(factory().createProcedure());
     EXPECT_EQ((std::vector<std::string>{"ended"}), Deaths);
     factory().releaseAllMemory();
     EXPECT_EQ((std::vector<std::string>{"ended", "client", "first", "last"}), Deaths);

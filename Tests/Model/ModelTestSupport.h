@@ -62,6 +62,11 @@ public:
     void replaceConstantCondition() override {}
     void foldConstants() override { ++m_Folds; }
     bool hasSideEffects() override { return m_HasSideEffects; }
+    bool containsExternCalls() override { return m_ContainsExternCalls; }
+    void markAsContainsExternCalls() override { m_ContainsExternCalls = true; }
+    leda::list<ZfCCfgVariable*> getExternModifiableVariables() override { return m_Extern; }
+    void appendExternModifiableVariable(ZfCCfgVariable* p) override { m_Extern.append(p); }
+    void appendPossiblyExternUsedVariable(ZfCCfgVariable* p) override { m_Extern.append(p); }
     ZfCCfgSFExpression* isSFExpression() override { return this; }
     void actOnComparisonOutsideBoolRange() override {}
 
@@ -69,6 +74,8 @@ public:
     ZfCCfgValue m_Value = eCfgValueUndetermined;
     ZfCCfgValue m_Minimum = eCfgValueUndetermined;
     ZfCCfgValue m_Maximum = eCfgValueUndetermined;
+    leda::list<ZfCCfgVariable*> m_Extern;
+    bool m_ContainsExternCalls = false;
     bool m_HasSideEffects = false;
     int m_Folds = 0;
 
@@ -98,12 +105,13 @@ public:
                         const char* Category, const char* Text) override {
         m_Messages.push_back(std::to_string(Severity) + " " + std::to_string(Number) + " " +
                              Category + "|" + Text);
-        m_pSrcRef = pSrcRef;
+        m_Text += std::to_string(Severity) + " " + std::to_string(Number) + " " +
+                  (pSrcRef != nullptr ? "@" : "") + Category + "|" + Text + "\n";
     }
 
     std::vector<std::string> m_Messages;
     std::vector<std::string> m_Assertions;
-    const ZfCSrcRef* m_pSrcRef = nullptr;
+    std::string m_Text; // the messages, a line each, with an @ where there is a source reference
 
 private:
     static void hear(const char*, int, const char* Condition) {

@@ -68,6 +68,18 @@ TEST_F(StatementTest, AssignmentHandsEverythingOnToItsRightHandSide) {
     p->setRHS(pRHS);
     p->foldConstants();
     EXPECT_EQ(0, pRHS->m_Folds); // an init assignment stays as it is
+    p->markAsContainsExternCalls();
+    p->appendExternModifiableVariable(&b);
+    p->appendPossiblyExternUsedVariable(&c);
+    EXPECT_TRUE(p->containsExternCalls());
+    EXPECT_EQ((Variables{&b, &c}), elements(p->getExternModifiableVariables()));
+    p->setRHS(factory().createValueExpression()); // an expression that knows no extern calls
+    p->markAsContainsExternCalls();
+    p->appendExternModifiableVariable(&b);
+    p->appendPossiblyExternUsedVariable(&c);
+    EXPECT_FALSE(p->containsExternCalls());
+    EXPECT_TRUE(p->getExternModifiableVariables().empty());
+    p->setRHS(pRHS);
     EXPECT_TRUE(p->hasSideEffects());
     EXPECT_EQ(Variables{&a}, elements(p->getDefinedVariables()));
     EXPECT_EQ(Variables{&b}, elements(p->getUsedVariables()));
@@ -153,7 +165,7 @@ TEST_F(StatementTest, ParameterJoinsTheArgumentsOfItsCalls) {
     ZfCCfgParamStatement* const p = new ZfCCfgParamStatement(&a);
     EXPECT_KIND(eCfgValueUndetermined, p->evaluate());
     EXPECT_CONSTANT(0.0, p->getMinimum());
-    ZfCCfgProcedureCall* Calls[] = {new ZfCCfgProcedureCall("f"), new ZfCCfgProcedureCall("f")};
+    ZfCCfgProcedureCall* Calls[] = {new ZfCCfgProcedureCall("f"), new ZfCCfgProcedureCall};
     Expression* Arguments[] = {new Expression, new Expression};
     for (int i = 0; i < 2; ++i) {
         factory().addSFExpression(Arguments[i]);
@@ -263,8 +275,11 @@ TEST_F(BlockTest, SplitGivesTheSecondHalfWithPhiFunctionsAndCondition) {
     ZfCBasicBlock* const p = factory().createBasicBlock();
     ZfCCfgStatement* Statements[] = {new ZfCCfgOutputStatement(&a), new ZfCCfgOutputStatement(&b),
                                      new ZfCCfgOutputStatement(&c)};
-    for (ZfCCfgStatement* pStmt : Statements)
-        p->append(pStmt);
+    leda::list<ZfCCfgStatement*> Rest;
+    Rest.append(Statements[1]);
+    Rest.append(Statements[2]);
+    p->append(Statements[0]);
+    p->append(Rest);
     ZfCCfgExpression* const pCondition = factory().createValueExpression();
     p->append(makePhi(&a, {}));
     p->appendBranch(factory().createValueExpression());
@@ -319,6 +334,8 @@ TEST_F(StatementTest, ProcedureStaysCallableFromOutsideOnceACallSaysSo) {
     p->appendCall(new ZfCCfgProcedureCall("f"));
     EXPECT_TRUE(p->isDirectlyOrIndirectlyCallableFromOutside());
     EXPECT_EQ(3, p->getCalls().size());
+    EXPECT_EQ(pMarked, elements(p->getCalls())[1]); // in the order of the calls
+    p->appendUsedVariable(&c);
     p->appendDefinedVariable(&a);
     p->getDefinedVariables().insert(&b); // changes a copy
     EXPECT_EQ(1, p->getDefinedVariables().size());
@@ -328,6 +345,8 @@ TEST_F(StatementTest, ProcedureStaysCallableFromOutsideOnceACallSaysSo) {
     p->setEntryNode(v);
     p->resetData();
     EXPECT_STREQ("", p->getName().cstring());
+    EXPECT_TRUE(p->getCalls().empty() && p->getUsedVariables().empty());
+    EXPECT_FALSE(p->isDirectlyOrIndirectlyCallableFromOutside());
     EXPECT_EQ(v, p->getEntryNode()); // nodes stay while parked
     p->initData();
     EXPECT_EQ(nullptr, p->getEntryNode());

@@ -19,6 +19,10 @@ TEST_F(VariableTest, MarkersOfArrayAndVolatileMakeNonConstant) {
     EXPECT_TRUE(Volatile.isVolatile() && Volatile.getValue().isNonConstant());
     EXPECT_TRUE(Erasable.isErasable() && Erasable.getValue().isUndetermined());
     EXPECT_FALSE(Array.isVolatile() || Array.isErasable() || Volatile.isArray());
+    // Only a version has a range, and only the client knows an initial value.
+    Array.setMinValueAndDestroyOld(ZfCCfgValue(1.0));
+    Array.setMaxValueAndDestroyOld(ZfCCfgValue(1.0));
+    EXPECT_KIND(eCfgValueUndetermined, Array.ZfCCfgVariable::getInitValue());
     EXPECT_CONSTANT(0.0, Array.getMinValue());
     EXPECT_CONSTANT(0.0, Array.getMaxValue());
 }
@@ -221,9 +225,15 @@ TEST_F(ExpressionTest, MarkedExpressionIsNonConstantWhateverItHolds) {
     Variable v;
     ZfCCfgExplicitVarUse* const p = factory().createExplicitVarUse(true);
     p->addVariable(&v);
+    p->replaceConditionWithConstant(1.0);
+    p->replaceConstantVariables();
+    p->replaceConstantCondition();
+    p->foldConstants();
+    p->actOnComparisonOutsideBoolRange();
     EXPECT_KIND(eCfgValueNonConstant, p->evaluate());
     EXPECT_KIND(eCfgValueNonConstant, p->getMinimum());
     EXPECT_KIND(eCfgValueNonConstant, p->getMaximum());
+    EXPECT_EQ(std::vector<ZfCCfgVariable*>{&v}, elements(p->getUsedVariables()));
 }
 
 } // namespace

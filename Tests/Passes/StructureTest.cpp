@@ -43,17 +43,6 @@ TEST(StructureEdits, SplitMovesContentsAndOutEdgesToTheSecondHalf) {
     EXPECT_EQ(P.blockOf(c)->getProcedure(), P.procedure("#main"));
 }
 
-TEST(StructureEdits, SplitOfANodeWithoutABlockIsAnInternalError) {
-    Program P;
-    leda::node Entry = P.entry("#main");
-    Reports R(false);
-    P.graph().splitAtCondition(Entry);
-    ASSERT_EQ(R.Messages.size(), 1u);
-    EXPECT_EQ(R.Messages[0].rfind("10007: Internal error. Error code: ZfCControlFlowGraph ", 0),
-              0u);
-    EXPECT_TRUE(Reports::assertions().empty());
-}
-
 TEST(StructureEdits, DivideLeavesOneItemForEachNodeAndKeepsEdges) {
     Program P;
     leda::node Entry = P.entry("#main"), v = P.block("a=1; b=2; ? a<b"), Empty = P.block(),

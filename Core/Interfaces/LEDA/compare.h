@@ -2,6 +2,7 @@
 #define LEDA_COMPARE_H
 
 #include <cstddef>
+#include <cstdint>
 #include <type_traits>
 
 namespace leda {
@@ -66,6 +67,19 @@ int call(const T&, const T&, long) {
 }
 
 } // namespace order_detail
+
+// The number that stands for an element in its order, for element types whose comparison is one of
+// numbers: of(a) < of(b) exactly if compare(a, b) < 0. A specialisation sets known and gives of;
+// it goes in front of the first use of a container with that element type. Containers then read
+// each element's number once instead of comparing pairs, which makes merging several times faster.
+// Types without it, and pointers to derived classes, are compared pair by pair.
+// LEDA_ORDER_NUMBERS says that there is such a thing, for code that also runs on other layers.
+#define LEDA_ORDER_NUMBERS 1
+template <class T>
+struct order_number {
+    static constexpr bool known = std::is_integral_v<T> && sizeof(T) <= 4;
+    static std::int64_t of(const T& x) { return static_cast<std::int64_t>(x); }
+};
 
 // The order of an element type: what the containers use unless they were given a function.
 template <class T>

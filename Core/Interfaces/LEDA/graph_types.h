@@ -1,6 +1,10 @@
 #ifndef LEDA_GRAPH_TYPES_H
 #define LEDA_GRAPH_TYPES_H
 
+#include "LEDA/compare.h"
+
+#include <cstdint>
+
 namespace leda {
 
 class graph;
@@ -29,7 +33,7 @@ private:
     friend class graph;
     template <class N, class E>
     friend class GRAPH;
-    friend int compare(const node& a, const node& b);
+    friend struct order_number<node>;
     node_struct() = default;
 
     // What a search reads stands together, so that it mostly lies in one cache line.
@@ -63,7 +67,7 @@ private:
     friend class graph;
     template <class N, class E>
     friend class GRAPH;
-    friend int compare(const edge& a, const edge& b);
+    friend struct order_number<edge>;
     edge_struct() = default;
 
     // As in a node, what a search reads comes first.
@@ -81,10 +85,8 @@ private:
 
 namespace order_detail {
 
-inline int compare_numbers(int a_index, int b_index, unsigned int a_graph, unsigned int b_graph) {
-    if (a_index != b_index)
-        return a_index < b_index ? -1 : 1;
-    return (a_graph > b_graph) - (a_graph < b_graph);
+inline std::int64_t number_of(int index, unsigned int graph) {
+    return static_cast<std::int64_t>(index) << 32 | graph;
 }
 
 } // namespace order_detail
@@ -92,20 +94,30 @@ inline int compare_numbers(int a_index, int b_index, unsigned int a_graph, unsig
 // Order of node and edge handles: by index, that is by creation; handles of different graphs with
 // the same index by the creation of their graphs; null before any other. Never by address, so that
 // sets of nodes look the same in every run.
+template <>
+struct order_number<node> {
+    static constexpr bool known = true;
+    static std::int64_t of(const node& v) {
+        return v ? order_detail::number_of(v->m_index, v->m_graph) : -1;
+    }
+};
+
+template <>
+struct order_number<edge> {
+    static constexpr bool known = true;
+    static std::int64_t of(const edge& e) {
+        return e ? order_detail::number_of(e->m_index, e->m_graph) : -1;
+    }
+};
+
 inline int compare(const node& a, const node& b) {
-    if (a == b)
-        return 0;
-    if (!a || !b)
-        return a ? 1 : -1;
-    return order_detail::compare_numbers(a->m_index, b->m_index, a->m_graph, b->m_graph);
+    const std::int64_t left = order_number<node>::of(a), right = order_number<node>::of(b);
+    return (left > right) - (left < right);
 }
 
 inline int compare(const edge& a, const edge& b) {
-    if (a == b)
-        return 0;
-    if (!a || !b)
-        return a ? 1 : -1;
-    return order_detail::compare_numbers(a->m_index, b->m_index, a->m_graph, b->m_graph);
+    const std::int64_t left = order_number<edge>::of(a), right = order_number<edge>::of(b);
+    return (left > right) - (left < right);
 }
 
 } // namespace leda

@@ -29,20 +29,41 @@ std::uint64_t bits(const K& key) {
     }
 }
 
-// Preferred slot in a table of 2^log_slots. Nodes go by their index and integers by their value:
-// they are dense, so a table over them has hardly a collision and is walked in the order of memory.
-// Other pointers are spread by multiplication, edges among them: the storage of a deleted edge is
-// used again, so the index of a stale key could not be asked.
+// Handles lie densely in the pools: in a table of some size each page of memory has a block of 64
+// slots, in the order of the page's 64 lines. Handles made one after the other then mostly are
+// neighbours in the table as well, and the object behind a key need not be read.
+template <class K>
+constexpr bool is_handle = std::is_same_v<K, node> || std::is_same_v<K, edge>;
+constexpr int log_block = 6;
+
+template <class K>
+bool by_blocks(int log_slots) {
+    return is_handle<K> && log_slots >= log_block + 2;
+}
+
+// Preferred slot in a table of 2^log_slots. Integers go by their value: they are dense, so a table
+// over them has hardly a collision and is walked in the order of memory. Pointers are spread by
+// multiplication, or the pages are where a table goes by blocks.
 template <class K>
 std::size_t home(const K& key, int log_slots) {
-    if constexpr (std::is_same_v<K, node>) {
-        return (key ? std::size_t(unsigned(key->index())) : 0) &
-               ((std::size_t(1) << log_slots) - 1);
-    } else if constexpr (std::is_pointer_v<K>) {
+    if constexpr (std::is_pointer_v<K>) {
+        if (by_blocks<K>(log_slots)) {
+            const std::uint64_t line = bits(key) >> 6;
+            const std::uint64_t block =
+                ((line >> log_block) * golden) >> (64 + log_block - log_slots);
+            return std::size_t(block << log_block | (line & ((1u << log_block) - 1)));
+        }
         return std::size_t((bits(key) * golden) >> (64 - log_slots));
     } else {
         return std::size_t(bits(key)) & ((std::size_t(1) << log_slots) - 1);
     }
+}
+
+// How far apart, by one bit of the slot's number, the slots lie that a key tries first. Where two
+// pages have the same block, the keys of one go to another block side by side.
+template <class K>
+int log_distance(int log_slots) {
+    return by_blocks<K>(log_slots) ? log_block : 0;
 }
 
 } // namespace hash_detail
@@ -54,8 +75,7 @@ std::size_t home(const K& key, int log_slots) {
 // entry. Lookup and insertion take O(1) expected; the table is at most three quarters full, begins
 // with 8 slots at the first entry and doubles. Clearing costs the table's size, which a map with
 // few entries keeps small. A reference from operator[] or lookup holds until the next entry is
-// made: never write map[a] = map[b] where map[b] may be made. Nodes as keys may be deleted, but a
-// map must be cleared before its nodes' graph is, if it is to be used on.
+// made: never write map[a] = map[b] where map[b] may be made. What a key points to is never read.
 template <class K, class V>
 class map {
 public:
@@ -98,13 +118,14 @@ private:
         ~slot() = delete;
     };
     // The slots of a key in the order to try: four of one neighbourhood, then pseudo-random ones
-    // that in the end reach every slot. Keys whose homes fall together, as the nodes of two graphs
-    // do, so do not pile up behind each other.
+    // that in the end reach every slot. Keys whose homes fall together so do not pile up behind
+    // each other.
     struct probe {
         std::size_t base;
         std::uint64_t perturb;
-        unsigned int step = 0;
-        std::size_t current() const { return base ^ step; }
+        int log_distance;
+        std::size_t step = 0;
+        std::size_t current() const { return base ^ step << log_distance; }
         void advance(std::size_t mask) {
             if (++step < 4)
                 return;
@@ -115,14 +136,14 @@ private:
     };
 
     static std::uint64_t tag_of(const K& key) { return hash_detail::bits(key) + 1; }
-    static probe probe_of(std::size_t home, std::uint64_t tag) {
-        return {home, tag * hash_detail::golden};
+    probe probe_of(std::size_t home, std::uint64_t tag) const {
+        return {home, tag * hash_detail::golden, hash_detail::log_distance<K>(m_log_slots)};
     }
     std::size_t slots() const { return m_slots ? std::size_t(1) << m_log_slots : 0; }
     std::size_t home_of_tag(std::uint64_t tag) const;
 
-    slot* free_slot(std::size_t home, std::uint64_t tag);
-    V& make(const K& key);
+    slot* find(std::size_t home, std::uint64_t tag) const;
+    V& make(slot* s, std::uint64_t tag, const K& key);
     void new_table(int log_slots);
     void grow();
     void copy_from(const map& other);
@@ -158,9 +179,11 @@ map<K, V>& map<K, V>::operator=(map&& other) noexcept {
 
 template <class K, class V>
 V& map<K, V>::operator[](const K& key) {
-    if (V* value = lookup(key))
-        return *value;
-    return make(key);
+    const std::uint64_t tag = tag_of(key);
+    slot* s = m_slots ? find(hash_detail::home(key, m_log_slots), tag) : nullptr;
+    if (s && s->tag == tag)
+        return s->value;
+    return make(s, tag, key);
 }
 
 template <class K, class V>
@@ -168,14 +191,8 @@ const V* map<K, V>::lookup(const K& key) const {
     if (!m_slots)
         return nullptr;
     const std::uint64_t tag = tag_of(key);
-    const std::size_t mask = slots() - 1;
-    for (probe p = probe_of(hash_detail::home(key, m_log_slots), tag);; p.advance(mask)) {
-        const slot& s = m_slots[p.current()];
-        if (s.tag == tag)
-            return &s.value;
-        if (s.tag == no_key)
-            return nullptr;
-    }
+    const slot* s = find(hash_detail::home(key, m_log_slots), tag);
+    return s->tag == tag ? &s->value : nullptr;
 }
 
 template <class K, class V>
@@ -225,20 +242,28 @@ std::size_t map<K, V>::home_of_tag(std::uint64_t tag) const {
         return hash_detail::home(K(std::uint32_t(tag - 1)), m_log_slots);
 }
 
+// The slot of the key, or the free one that it would take; there always is a free one.
 template <class K, class V>
-typename map<K, V>::slot* map<K, V>::free_slot(std::size_t home, std::uint64_t tag) {
+typename map<K, V>::slot* map<K, V>::find(std::size_t home, std::uint64_t tag) const {
+    slot* s = m_slots + home;
+    if (s->tag == tag || s->tag == no_key)
+        return s;
+    const std::size_t mask = slots() - 1;
     probe p = probe_of(home, tag);
-    while (m_slots[p.current()].tag != no_key)
-        p.advance(slots() - 1);
-    return m_slots + p.current();
+    do {
+        p.advance(mask);
+        s = m_slots + p.current();
+    } while (s->tag != tag && s->tag != no_key);
+    return s;
 }
 
+// Makes the entry in the slot that find gave for its key, unless the table has to grow.
 template <class K, class V>
-V& map<K, V>::make(const K& key) {
-    if (std::size_t(m_size + 1) * 4 > slots() * 3)
+V& map<K, V>::make(slot* s, std::uint64_t tag, const K& key) {
+    if (std::size_t(m_size + 1) * 4 > slots() * 3) {
         grow();
-    const std::uint64_t tag = tag_of(key);
-    slot* s = free_slot(hash_detail::home(key, m_log_slots), tag);
+        s = find(hash_detail::home(key, m_log_slots), tag);
+    }
     ::new (static_cast<void*>(&s->value)) V(m_default);
     s->tag = tag;
     ++m_size;
@@ -261,7 +286,7 @@ void map<K, V>::grow() {
     for (std::size_t i = 0; i < old_slots; ++i) {
         if (old[i].tag == no_key)
             continue;
-        slot* s = free_slot(home_of_tag(old[i].tag), old[i].tag);
+        slot* s = find(home_of_tag(old[i].tag), old[i].tag);
         ::new (static_cast<void*>(&s->value)) V(std::move(old[i].value));
         s->tag = old[i].tag;
         old[i].value.~V();

@@ -3,6 +3,7 @@
 
 #include "LEDA/allocator.h"
 #include "LEDA/compare.h"
+#include "LEDA/sorted_arrays.h"
 #include "LEDA/sorted_chunks.h"
 
 #include <cstddef>
@@ -107,21 +108,24 @@ private:
     bool is_flat() const { return m_capacity != 0; }
     T* data() { return m_capacity == inline_slots ? m_inline : m_array; }
     const T* data() const { return m_capacity == inline_slots ? m_inline : m_array; }
-    static bool same(const T& a, const T& b) { return std::memcmp(&a, &b, sizeof(T)) == 0; }
-    static int order(const T& a, const T& b) { return same(a, b) ? 0 : key_order<T>(a, b); }
+    static bool same(const T& a, const T& b) { return sorted_arrays::same(a, b); }
+    static int order(const T& a, const T& b) { return sorted_arrays::order(a, b); }
+    static void copy(T* to, const T* from, int n) {
+        std::memcpy(static_cast<void*>(to), from, std::size_t(n) * sizeof(T));
+    }
     static int capacity_for(int n);
 
     bool find_flat(const T& x, int& slot) const;
     void insert_flat(const T& x, int slot);
     void reserve_flat(int capacity);
-    void turn_into_chunks();
     void copy_from(const set& other);
     void take(set& other) noexcept;
     void release();
     void copy_array(const T* from);
     void assign_sorted(const T* first, int n);
     void merge_flat(const set& other);
-    void assign_merged(const T* low, int lows, const T* high, int highs);
+    void replace(int from, int to, const T* elements, int n);
+    void replace_in_chunks(int from, int to, const T* elements, int n);
     void merge_chunks(const set& other);
 
     position where(set_item it) const;
@@ -152,8 +156,7 @@ public:
     const T& operator*() const { return *m_current; }
     const T* operator->() const { return m_current; }
     const_iterator& operator++() {
-        if (++m_current == m_end)
-            next_run();
+        skip(1);
         return *this;
     }
     const_iterator operator++(int) {
@@ -166,6 +169,13 @@ public:
 
 private:
     friend class set;
+    // Elements that stand in a row from here on, up to a limit; and a step over some of them.
+    int run(int limit) const { return m_end - m_current < limit ? int(m_end - m_current) : limit; }
+    void skip(int n) {
+        m_current += n;
+        if (m_current == m_end)
+            next_run();
+    }
     void next_run() {
         m_current = m_end = nullptr;
         if (m_chunks && m_chunk < m_chunks->chunks()) {
@@ -198,10 +208,16 @@ typename set<T, Impl>::const_iterator set<T, Impl>::begin() const {
 
 template <class T, class Impl>
 set<T, Impl>& set<T, Impl>::operator=(const set& other) {
-    if (this != &other) {
-        release();
-        copy_from(other);
+    if (this == &other)
+        return *this;
+    if (is_flat() && other.is_flat() && other.m_size <= m_capacity &&
+        m_capacity <= 2 * other.m_size) {
+        copy(data(), other.data(), other.m_size); // the array fits: it is kept
+        m_size = other.m_size;
+        return *this;
     }
+    release();
+    copy_from(other);
     return *this;
 }
 
@@ -288,6 +304,11 @@ template <class T, class Impl>
 void set<T, Impl>::intersect_with(const set& other) {
     if (this == &other)
         return;
+    if (is_flat() && other.is_flat()) {
+        m_size =
+            sorted_arrays::intersect<T, flat_slots>(data(), m_size, other.data(), other.m_size);
+        return;
+    }
     set result;
     if (m_size < other.m_size / 16) {
         for (const T& x : *this)
@@ -342,7 +363,7 @@ int set<T, Impl>::capacity_for(int n) {
     return capacity;
 }
 
-// Looks from the end first, as elements mostly come in ascending order.
+// Looks at the end first, as elements mostly come in ascending order.
 template <class T, class Impl>
 bool set<T, Impl>::find_flat(const T& x, int& slot) const {
     const T* elements = data();
@@ -374,39 +395,26 @@ bool set<T, Impl>::find_flat(const T& x, int& slot) const {
 
 template <class T, class Impl>
 void set<T, Impl>::insert_flat(const T& x, int slot) {
-    const T copy = x; // x may lie in the storage that moves
+    const T fresh = x; // x may lie in the storage that moves
     if (m_size == flat_slots) {
-        turn_into_chunks();
-        m_chunks->insert({0, slot}, copy);
-        ++m_size;
+        replace_in_chunks(slot, slot, &fresh, 1);
         return;
     }
     if (m_size == m_capacity)
         reserve_flat(2 * m_capacity);
     T* elements = data();
     std::memmove(elements + slot + 1, elements + slot, std::size_t(m_size - slot) * sizeof(T));
-    elements[slot] = copy;
+    elements[slot] = fresh;
     ++m_size;
 }
 
 template <class T, class Impl>
 void set<T, Impl>::reserve_flat(int capacity) {
     T* grown = pool_allocate_array<T>(std::size_t(capacity));
-    std::memcpy(grown, data(), std::size_t(m_size) * sizeof(T));
+    copy(grown, data(), m_size);
     release();
     m_array = grown;
     m_capacity = capacity;
-}
-
-template <class T, class Impl>
-void set<T, Impl>::turn_into_chunks() {
-    static_assert(chunks::capacity > flat_slots);
-    chunks* large = pool_new<chunks>();
-    for (int i = 0; i < m_size; ++i)
-        large->append(data()[i]);
-    release();
-    m_chunks = large;
-    m_capacity = 0;
 }
 
 template <class T, class Impl>
@@ -480,103 +488,107 @@ void set<T, Impl>::assign_sorted(const T* first, int n) {
         m_capacity = capacity_for(n);
         m_array = pool_allocate_array<T>(std::size_t(m_capacity));
     }
-    std::memcpy(static_cast<void*>(data()), first, std::size_t(n) * sizeof(T));
+    copy(data(), first, n);
     m_size = n;
 }
 
 // Elements that both sets have at the front or at the end are equal bytes: they cost no comparison.
-// The rest is merged from both ends at once, as long as both sides have two elements left: the two
-// steps of a round do not wait for each other.
+// What is left of the other set is nothing, or lies behind all that is left of this one, or is
+// merged with it.
 template <class T, class Impl>
 void set<T, Impl>::merge_flat(const set& other) {
-    T merged[2 * flat_slots];
     const T* a = data();
     const T* b = other.data();
-    const T* a_end = a + m_size;
-    const T* b_end = b + other.m_size;
-    T* low = merged;
-    T* const high_end = merged + 2 * flat_slots;
-    T* high = high_end;
-    while (a != a_end && b != b_end && same(*a, *b)) {
-        *low++ = *a++;
-        ++b;
+    int from = 0, to = m_size, b_to = other.m_size;
+    while (from < to && from < b_to && same(a[from], b[from]))
+        ++from;
+    while (from < to && from < b_to && same(a[to - 1], b[b_to - 1])) {
+        --to;
+        --b_to;
     }
-    while (a != a_end && b != b_end && same(a_end[-1], b_end[-1])) {
-        *--high = *--a_end;
-        --b_end;
+    if (from == b_to)
+        return;
+    if (from == to || key_order<T>(a[to - 1], b[from]) < 0) {
+        replace(to, to, b + from, b_to - from);
+        return;
     }
-    while (a_end - a >= 2 && b_end - b >= 2) {
-        const int at_low = key_order<T>(*a, *b);
-        const int at_high = key_order<T>(a_end[-1], b_end[-1]);
-        const T* const firsts[2] = {b, a};
-        const T* const ends[2] = {b_end, a_end};
-        const std::size_t low_from_a = order_detail::number(at_low <= 0);
-        const std::size_t high_from_a = order_detail::number(at_high >= 0);
-        *low++ = *firsts[low_from_a];
-        *--high = ends[high_from_a][-1];
-        a += low_from_a;
-        b += order_detail::number(at_low >= 0);
-        a_end -= high_from_a;
-        b_end -= order_detail::number(at_high <= 0);
-    }
-    while (a != a_end && b != b_end) {
-        const int sign = key_order<T>(*a, *b);
-        const T* const firsts[2] = {b, a};
-        const std::size_t from_a = order_detail::number(sign <= 0);
-        *low++ = *firsts[from_a];
-        a += from_a;
-        b += order_detail::number(sign >= 0);
-    }
-    while (a != a_end)
-        *low++ = *a++;
-    while (b != b_end)
-        *low++ = *b++;
-    assign_merged(merged, int(low - merged), high, int(high_end - high));
+    T merged[2 * flat_slots];
+    const int n =
+        sorted_arrays::unite<T, flat_slots>(a + from, to - from, b + from, b_to - from, merged);
+    if (n != to - from)
+        replace(from, to, merged, n);
 }
 
-// Makes the elements those of two runs, the second behind the first, outside this set. There are no
-// fewer than now, and no more without a change.
+// Puts elements from outside this set in place of a part of it, which is not longer; they keep the
+// order.
 template <class T, class Impl>
-void set<T, Impl>::assign_merged(const T* low, int lows, const T* high, int highs) {
-    const int n = lows + highs;
-    if (n == m_size)
-        return;
-    if (n <= flat_slots) {
-        if (n > m_capacity)
-            reserve_flat(capacity_for(n));
-        T* to = data();
-        for (int i = 0; i < lows; ++i)
-            *to++ = low[i];
-        for (int i = 0; i < highs; ++i)
-            *to++ = high[i];
-        m_size = n;
+void set<T, Impl>::replace(int from, int to, const T* elements, int n) {
+    const int rest = m_size - to;
+    if (from + n + rest > flat_slots) {
+        replace_in_chunks(from, to, elements, n);
         return;
     }
-    turn_into_chunks();
-    m_chunks->clear();
-    for (int i = 0; i < lows; ++i)
-        m_chunks->append(low[i]);
-    for (int i = 0; i < highs; ++i)
-        m_chunks->append(high[i]);
-    m_size = n;
+    T* target = data();
+    const T* old = target;
+    if (from + n + rest > m_capacity) {
+        const int capacity = capacity_for(from + n + rest);
+        target = pool_allocate_array<T>(std::size_t(capacity));
+        if (from)
+            copy(target, old, from);
+        if (rest)
+            copy(target + from + n, old + to, rest);
+        copy(target + from, elements, n);
+        release();
+        m_array = target;
+        m_capacity = capacity;
+    } else {
+        std::memmove(static_cast<void*>(target + from + n), target + to,
+                     std::size_t(rest) * sizeof(T));
+        copy(target + from, elements, n);
+    }
+    m_size = from + n + rest;
 }
 
+// The same for a set that becomes too large for an array.
+template <class T, class Impl>
+void set<T, Impl>::replace_in_chunks(int from, int to, const T* elements, int n) {
+    chunks* large = pool_new<chunks>();
+    large->append(data(), from);
+    large->append(elements, n);
+    large->append(data() + to, m_size - to);
+    release();
+    m_chunks = large;
+    m_capacity = 0;
+    m_size = large->size();
+}
+
+// Merges block by block: of the two next blocks as much as lies up to the smaller one's end.
 template <class T, class Impl>
 void set<T, Impl>::merge_chunks(const set& other) {
     chunks* merged = pool_new<chunks>();
     const_iterator a = begin(), b = other.begin();
+    T block[2 * flat_slots];
     while (a != end() && b != end()) {
-        const int sign = order(*a, *b);
-        merged->append(sign <= 0 ? *a : *b);
-        if (sign <= 0)
-            ++a;
-        if (sign >= 0)
-            ++b;
+        int as = a.run(flat_slots), bs = b.run(flat_slots);
+        const T& a_last = a.m_current[as - 1];
+        const T& b_last = b.m_current[bs - 1];
+        const int sign = order(a_last, b_last);
+        if (sign < 0) {
+            bs = sorted_arrays::lower_bound(b.m_current, bs, a_last);
+            bs += order(b.m_current[bs], a_last) == 0;
+        } else if (sign > 0) {
+            as = sorted_arrays::lower_bound(a.m_current, as, b_last);
+            as += order(a.m_current[as], b_last) == 0;
+        }
+        merged->append(
+            block, sorted_arrays::unite<T, flat_slots>(a.m_current, as, b.m_current, bs, block));
+        a.skip(as);
+        b.skip(bs);
     }
-    for (; a != end(); ++a)
-        merged->append(*a);
-    for (; b != end(); ++b)
-        merged->append(*b);
+    for (; a != end(); a.next_run())
+        merged->append(a.m_current, a.run(chunks::capacity));
+    for (; b != end(); b.next_run())
+        merged->append(b.m_current, b.run(chunks::capacity));
     release();
     m_chunks = merged;
     m_capacity = 0;

@@ -60,6 +60,7 @@ public:
     void erase(position p);
     // Adds behind the last entry.
     void append(const E& entry);
+    void append(const E* first, int n);
 
     // True if chunks are neither empty nor over-full, the directory and the size agree with them,
     // and precedes holds for each entry and its successor. Linear.
@@ -192,6 +193,25 @@ void sorted_chunks<E>::append(const E& entry) {
     body_struct* body = m_directory[m_chunks - 1].body;
     body->entries[body->count++] = entry;
     ++m_size;
+}
+
+template <class E>
+void sorted_chunks<E>::append(const E* first, int n) {
+    while (n > 0) {
+        if (m_chunks == 0 || count(m_chunks - 1) == capacity) {
+            append(*first++);
+            --n;
+            continue;
+        }
+        body_struct* body = m_directory[m_chunks - 1].body;
+        const int room = capacity - body->count;
+        const int part = n < room ? n : room;
+        shift(body->entries + body->count, first, part);
+        body->count += part;
+        m_size += part;
+        first += part;
+        n -= part;
+    }
 }
 
 // A chunk that has become small joins a neighbour if the two leave room to grow, so that chunks

@@ -57,7 +57,7 @@ unsigned int shiftCount(std::int32_t Count) {
     std::abort();
 }
 
-std::int32_t remainder(std::int32_t Dividend, std::int32_t Divisor) {
+std::int32_t remainderOf(std::int32_t Dividend, std::int32_t Divisor) {
     if (Divisor == 0 || (Divisor == -1 && Dividend == std::numeric_limits<std::int32_t>::min()))
         raiseDivisionFault();
     return Dividend % Divisor;
@@ -187,7 +187,7 @@ ZfCCfgValue operator/(ZfCCfgValue& Left, ZfCCfgValue& Right) {
 }
 
 ZfCCfgValue operator%(ZfCCfgValue& Left, ZfCCfgValue& Right) {
-    return applyInt32(Left, Right, remainder);
+    return applyInt32(Left, Right, remainderOf);
 }
 
 ZfCCfgValue operator<<(ZfCCfgValue& Left, ZfCCfgValue& Right) {

@@ -7,10 +7,27 @@
 #include "LEDA/slist.h"
 #include "ZfCCfgValue.h"
 
+#include <cstdint>
+#include <limits>
+
 class ZfCCfgFactory;
 class ZfCCfgSFVariable;
+class ZfCCfgVariable;
 class ZfCCfgVisitor;
 class ZfCSSAVariable;
+
+#ifdef LEDA_ORDER_NUMBERS
+namespace leda {
+
+// Lets sets of variables merge by number, where the layer below knows how; as compare below.
+template <>
+struct order_number<ZfCCfgVariable*> {
+    static constexpr bool known = true;
+    static inline std::int64_t of(ZfCCfgVariable* const& pVariable);
+};
+
+} // namespace leda
+#endif
 
 // A variable of the intermediate code.
 //
@@ -146,6 +163,13 @@ private:
 };
 
 namespace leda {
+
+#ifdef LEDA_ORDER_NUMBERS
+inline std::int64_t order_number<ZfCCfgVariable*>::of(ZfCCfgVariable* const& pVariable) {
+    return pVariable != nullptr ? pVariable->getDebugIndex()
+                                : std::numeric_limits<std::int64_t>::min();
+}
+#endif
 
 // Order of sets of variables: null first, then by debug index.
 inline int compare(ZfCCfgVariable* const& pLeft, ZfCCfgVariable* const& pRight) {

@@ -202,18 +202,6 @@ private:
 
     void computeIdomsFast(leda::set<leda::node, leda::avl_tree> ComponentNodes,
                           leda::map<leda::node, leda::node>& Idom);
-    void dfsDom(leda::node v, leda::node n0, int& n, leda::map<leda::node, leda::node>& Label,
-                leda::map<leda::node, leda::node>& Parent,
-                leda::map<leda::node, leda::node>& Ancestor,
-                leda::map<leda::node, leda::node>& Child, leda::map<int, leda::node>& Ndfs,
-                leda::map<leda::node, int>& Sdno, leda::map<leda::node, int>& Size);
-    leda::node eval(leda::node v, leda::node n0, leda::map<leda::node, leda::node>& Label,
-                    leda::map<leda::node, leda::node>& Ancestor, leda::map<leda::node, int>& Sdno);
-    void compress(leda::node v, leda::node n0, leda::map<leda::node, leda::node>& Label,
-                  leda::map<leda::node, leda::node>& Ancestor, leda::map<leda::node, int>& Sdno);
-    void link(leda::node v, leda::node w, leda::node n0, leda::map<leda::node, leda::node>& Label,
-              leda::map<leda::node, leda::node>& Ancestor, leda::map<leda::node, leda::node>& Child,
-              leda::map<leda::node, int>& Sdno, leda::map<leda::node, int>& Size);
     int buildDominatorTrees(leda::array<ZfCDominatorTree*>& DominatorTree);
     void freeDominatorTrees(leda::array<ZfCDominatorTree*>& DominatorTree, int Count);
 

@@ -15,8 +15,10 @@
 //
 // Departures: dfsDom and compress do not recurse, as a procedure may have a million nodes on one
 // path; they keep the open path on a stack and do the same steps in the same order. The absent
-// node n0 is a node of a graph of its own, so that the numbering of the program's nodes stays
-// dense. Worst case O(m a(m, n)) for n nodes and m edges.
+// node n0 is the number 0, which no node has. Only the numbering is a map by node; the other maps
+// of the paper are arrays by depth-first number, of the size of the component in hand. The order
+// within a bucket does not matter to the dominators, so a bucket is a chain and not a set. Worst
+// case O(m a(m, n)) for n nodes and m edges.
 
 #include "ZfCControlFlowGraph.h"
 
@@ -29,13 +31,196 @@ namespace {
 using NodeSet = leda::set<leda::node, leda::avl_tree>;
 using NodeMap = leda::map<leda::node, leda::node>;
 
-// The node that stands for no node. It lies in no program, so it can serve every computation.
-leda::node absentNode() {
-    static leda::graph Holder;
-    if (Holder.first_node() == nullptr) {
-        Holder.new_node();
+// The search in one component. Nodes go by their depth-first number; 0 is n0.
+class DominatorSearch {
+public:
+    DominatorSearch(leda::graph& Graph, int NumberOfNodes)
+        : m_Graph(Graph), Ndfs(NumberOfNodes + 1), m_Nodes(NumberOfNodes + 1) {}
+
+    // Steps 1 to 4 of the paper; enters the dominators of all nodes but the root.
+    void run(leda::node r, NodeMap& Idom);
+
+private:
+    // What the paper keeps of a node in maps of their own. As entries of n0, Sdno and Size are 0
+    // and Label and Ancestor n0.
+    struct Node {
+        int Label = 0;
+        int Parent = 0;
+        int Ancestor = 0;
+        int Child = 0;
+        int Sdno = 0;
+        int Size = 0;
+        int Bucket = 0;       // first of the nodes whose semidominator is this one
+        int NextInBucket = 0; // of the bucket that this node is in
+        int Idom = 0;
+    };
+
+    void dfsDom(leda::node v);
+    int enter(leda::node w);
+    int eval(int v);
+    void compress(int v);
+    void link(int v, int w);
+    void findSemidominator(int w);
+    void emptyBucket(int p);
+
+    leda::graph& m_Graph;
+    leda::map<leda::node, int> m_Number; // of the nodes entered
+    leda::array<leda::node> Ndfs;
+    leda::array<Node> m_Nodes; // by number
+    int n = 0;
+};
+
+void DominatorSearch::run(leda::node r, NodeMap& Idom) {
+    dfsDom(r);
+    // Semidominators, and dominators as far as they are known at once.
+    for (int w = n; w >= 2; --w) {
+        findSemidominator(w);
+        const int p = m_Nodes[w].Parent;
+        link(p, w);
+        emptyBucket(p);
     }
-    return Holder.first_node();
+    // The deferred dominators.
+    for (int w = 2; w <= n; ++w) {
+        Node& Of = m_Nodes[w];
+        if (Of.Idom != Of.Sdno) {
+            Of.Idom = m_Nodes[Of.Idom].Idom;
+        }
+        Idom[Ndfs[w]] = Ndfs[Of.Idom];
+    }
+}
+
+void DominatorSearch::findSemidominator(int w) {
+    int SdnoOfW = m_Nodes[w].Sdno;
+    for (leda::edge e = m_Graph.first_in_edge(Ndfs[w]); e != nullptr; e = m_Graph.in_succ(e)) {
+        const int* pSource = m_Number.lookup(m_Graph.source(e));
+        if (pSource == nullptr) {
+            continue; // the search has not been there, so no path comes from there
+        }
+        const int SdnoOfU = m_Nodes[eval(*pSource)].Sdno;
+        if (SdnoOfU < SdnoOfW) {
+            SdnoOfW = SdnoOfU;
+        }
+    }
+    m_Nodes[w].Sdno = SdnoOfW;
+    m_Nodes[w].NextInBucket = m_Nodes[SdnoOfW].Bucket;
+    m_Nodes[SdnoOfW].Bucket = w;
+}
+
+void DominatorSearch::emptyBucket(int p) {
+    for (int v = m_Nodes[p].Bucket; v != 0; v = m_Nodes[v].NextInBucket) {
+        const int u = eval(v);
+        m_Nodes[v].Idom = m_Nodes[u].Sdno < m_Nodes[v].Sdno ? u : p;
+    }
+    m_Nodes[p].Bucket = 0;
+}
+
+int DominatorSearch::enter(leda::node w) {
+    ++n;
+    m_Number[w] = n;
+    Ndfs[n] = w;
+    m_Nodes[n].Sdno = n;
+    m_Nodes[n].Label = n;
+    m_Nodes[n].Size = 1;
+    return n;
+}
+
+// The open path of the search stands in Path, as the tree edges by which its nodes were entered.
+void DominatorSearch::dfsDom(leda::node v) {
+    leda::stack<leda::edge> Path;
+    int Number = enter(v);
+    leda::edge e = m_Graph.first_adj_edge(v);
+    for (;;) {
+        while (e != nullptr && m_Number.defined(m_Graph.target(e))) {
+            e = m_Graph.adj_succ(e);
+        }
+        if (e != nullptr) {
+            // Down to a new node.
+            leda::node w = m_Graph.target(e);
+            const int Parent = Number;
+            Number = enter(w);
+            m_Nodes[Number].Parent = Parent;
+            Path.push(e);
+            e = m_Graph.first_adj_edge(w);
+        } else if (!Path.empty()) {
+            // Back, and on with the next out-edge of the parent.
+            Number = m_Nodes[Number].Parent;
+            e = m_Graph.adj_succ(Path.pop());
+        } else {
+            return;
+        }
+    }
+}
+
+int DominatorSearch::eval(int v) {
+    if (m_Nodes[v].Ancestor == 0) {
+        return m_Nodes[v].Label;
+    }
+    compress(v);
+    const int LabelOfV = m_Nodes[v].Label;
+    const int LabelOfA = m_Nodes[m_Nodes[v].Ancestor].Label;
+    return m_Nodes[LabelOfA].Sdno >= m_Nodes[LabelOfV].Sdno ? LabelOfV : LabelOfA;
+}
+
+// The way up is turned round while it is walked, by the links in Ancestor themselves; then it is
+// done from the top down, in which order a recursion would come back. Each node on it ends with the
+// same ancestor, the one below the root of its tree.
+void DominatorSearch::compress(int v) {
+    int Below = 0;
+    int a = m_Nodes[v].Ancestor;
+    while (m_Nodes[a].Ancestor != 0) {
+        const int Above = m_Nodes[v].Ancestor;
+        m_Nodes[v].Ancestor = Below;
+        Below = v;
+        v = Above;
+        a = m_Nodes[v].Ancestor;
+    }
+    const int Root = a;
+    int Former = v; // as the recursion left it: its ancestor is the root
+    while (Below != 0) {
+        const int Next = m_Nodes[Below].Ancestor;
+        const int LabelOfA = m_Nodes[Former].Label;
+        if (m_Nodes[LabelOfA].Sdno < m_Nodes[m_Nodes[Below].Label].Sdno) {
+            m_Nodes[Below].Label = LabelOfA;
+        }
+        m_Nodes[Below].Ancestor = Root;
+        Former = Below;
+        Below = Next;
+    }
+}
+
+void DominatorSearch::link(int v, int w) {
+    int s = w;
+    // Step 1: Sdno of n0 is smaller than any other, so the loop ends there at the latest.
+    const int LabelOfW = m_Nodes[w].Label;
+    const int SdnoOfW = m_Nodes[LabelOfW].Sdno;
+    for (;;) {
+        const int c = m_Nodes[s].Child;
+        if (SdnoOfW >= m_Nodes[m_Nodes[c].Label].Sdno) {
+            break;
+        }
+        const int ChildOfC = m_Nodes[c].Child;
+        if (m_Nodes[s].Size + m_Nodes[ChildOfC].Size >= 2 * m_Nodes[c].Size) {
+            m_Nodes[c].Ancestor = s;
+            m_Nodes[s].Child = ChildOfC;
+        } else {
+            m_Nodes[c].Size = m_Nodes[s].Size;
+            m_Nodes[s].Ancestor = c;
+            s = c;
+        }
+    }
+    // Step 2.
+    m_Nodes[s].Label = LabelOfW;
+    // Step 3.
+    m_Nodes[v].Size += m_Nodes[w].Size;
+    // Step 4.
+    if (m_Nodes[v].Size < 2 * m_Nodes[w].Size) {
+        std::swap(s, m_Nodes[v].Child);
+    }
+    // Step 5.
+    while (s != 0) {
+        m_Nodes[s].Ancestor = v;
+        s = m_Nodes[s].Child;
+    }
 }
 
 } // namespace
@@ -62,16 +247,9 @@ void ZfCControlFlowGraph::computeAllIdoms() {
 }
 
 void ZfCControlFlowGraph::computeIdomsFast(NodeSet ComponentNodes, NodeMap& Idom) {
-    // Step 1: the maps. A bucket that nobody has filled is empty, so none is entered beforehand.
-    NodeMap Label, Parent, Ancestor, Child;
-    leda::map<int, leda::node> Ndfs;
-    leda::map<leda::node, int> Sdno, Size;
-    leda::map<leda::node, NodeSet> Bucket;
+    // Step 2: the root.
     leda::node r = nullptr;
-    leda::node n0 = absentNode();
-    // Step 2: the root, and no node numbered.
     for (leda::node v : ComponentNodes) {
-        Sdno[v] = 0;
         if (indeg(v) == 0) {
             r = v;
         }
@@ -81,167 +259,8 @@ void ZfCControlFlowGraph::computeIdomsFast(NodeSet ComponentNodes, NodeMap& Idom
         reportInternalError("ZfCControlFlowGraph", __LINE__);
         return;
     }
-    // Step 4: the numbering.
-    Sdno[n0] = 0;
-    Size[n0] = 0;
-    Label[n0] = n0;
-    Ancestor[n0] = n0;
-    int n = 0;
-    dfsDom(r, n0, n, Label, Parent, Ancestor, Child, Ndfs, Sdno, Size);
-    // Step 5: semidominators, and dominators as far as they are known at once.
-    for (int i = n; i >= 2; --i) {
-        leda::node w = Ndfs[i];
-        // Step 5a.
-        int SdnoOfW = Sdno[w];
-        for (leda::edge e = first_in_edge(w); e != nullptr; e = in_succ(e)) {
-            leda::node u = eval(source(e), n0, Label, Ancestor, Sdno);
-            int SdnoOfU = Sdno[u];
-            if (SdnoOfU < SdnoOfW) {
-                SdnoOfW = SdnoOfU;
-            }
-        }
-        Sdno[w] = SdnoOfW;
-        // Step 5b.
-        Bucket[Ndfs[SdnoOfW]].insert(w);
-        // Step 5c.
-        leda::node p = Parent[w];
-        link(p, w, n0, Label, Ancestor, Child, Sdno, Size);
-        // Step 5d.
-        NodeSet* pBucket = Bucket.lookup(p);
-        while (pBucket != nullptr && !pBucket->empty()) {
-            leda::node v = pBucket->key(pBucket->first_item());
-            pBucket->del(v);
-            leda::node u = eval(v, n0, Label, Ancestor, Sdno);
-            int SdnoOfU = Sdno[u];
-            Idom[v] = SdnoOfU < Sdno[v] ? u : p;
-        }
-    }
-    // Step 6: the deferred dominators.
-    for (int i = 2; i <= n; ++i) {
-        leda::node w = Ndfs[i];
-        leda::node d = Idom[w];
-        if (d != Ndfs[Sdno[w]]) {
-            leda::node IdomOfD = Idom[d];
-            Idom[w] = IdomOfD;
-        }
-    }
-    // Step 7: nothing to take out of the graph, as n0 never was in it.
-}
-
-// The open path of the search stands in Path, as the tree edges by which its nodes were entered.
-void ZfCControlFlowGraph::dfsDom(leda::node v, leda::node n0, int& n, NodeMap& Label,
-                                 NodeMap& Parent, NodeMap& Ancestor, NodeMap& Child,
-                                 leda::map<int, leda::node>& Ndfs, leda::map<leda::node, int>& Sdno,
-                                 leda::map<leda::node, int>& Size) {
-    leda::stack<leda::edge> Path;
-    auto Enter = [&](leda::node w) {
-        ++n;
-        Sdno[w] = n;
-        Label[w] = w;
-        Ndfs[n] = w;
-        Ancestor[w] = n0;
-        Child[w] = n0;
-        Size[w] = 1;
-        return first_adj_edge(w);
-    };
-    leda::edge e = Enter(v);
-    for (;;) {
-        while (e != nullptr && Sdno[target(e)] != 0) {
-            e = adj_succ(e);
-        }
-        if (e != nullptr) {
-            // Down to a new node.
-            leda::node w = target(e);
-            Parent[w] = source(e);
-            Path.push(e);
-            e = Enter(w);
-        } else if (!Path.empty()) {
-            // Back, and on with the next out-edge of the parent.
-            e = adj_succ(Path.pop());
-        } else {
-            return;
-        }
-    }
-}
-
-leda::node ZfCControlFlowGraph::eval(leda::node v, leda::node n0, NodeMap& Label, NodeMap& Ancestor,
-                                     leda::map<leda::node, int>& Sdno) {
-    if (Ancestor[v] == n0) {
-        return Label[v];
-    }
-    compress(v, n0, Label, Ancestor, Sdno);
-    leda::node LabelOfV = Label[v];
-    leda::node LabelOfA = Label[Ancestor[v]];
-    int SdnoOfA = Sdno[LabelOfA];
-    return SdnoOfA >= Sdno[LabelOfV] ? LabelOfV : LabelOfA;
-}
-
-// The way up is collected first; then it is done from the top down, in which order a recursion
-// would come back.
-void ZfCControlFlowGraph::compress(leda::node v, leda::node n0, NodeMap& Label, NodeMap& Ancestor,
-                                   leda::map<leda::node, int>& Sdno) {
-    leda::stack<leda::node> Path;
-    leda::node a = Ancestor[v];
-    for (leda::node AncestorOfA = Ancestor[a]; AncestorOfA != n0; AncestorOfA = Ancestor[a]) {
-        Path.push(v);
-        v = a;
-        a = AncestorOfA;
-    }
-    while (!Path.empty()) {
-        v = Path.pop();
-        a = Ancestor[v];
-        leda::node LabelOfA = Label[a];
-        int SdnoOfA = Sdno[LabelOfA];
-        if (SdnoOfA < Sdno[Label[v]]) {
-            Label[v] = LabelOfA;
-        }
-        leda::node AncestorOfA = Ancestor[a];
-        Ancestor[v] = AncestorOfA;
-    }
-}
-
-void ZfCControlFlowGraph::link(leda::node v, leda::node w, leda::node n0, NodeMap& Label,
-                               NodeMap& Ancestor, NodeMap& Child, leda::map<leda::node, int>& Sdno,
-                               leda::map<leda::node, int>& Size) {
-    leda::node s = w;
-    // Step 1: Sdno of n0 is smaller than any other, so the loop ends there at the latest.
-    leda::node LabelOfW = Label[w];
-    int SdnoOfW = Sdno[LabelOfW];
-    for (;;) {
-        leda::node c = Child[s];
-        if (SdnoOfW >= Sdno[Label[c]]) {
-            break;
-        }
-        leda::node ChildOfC = Child[c];
-        int SizeOfS = Size[s];
-        int SizeOfC = Size[c];
-        if (SizeOfS + Size[ChildOfC] >= 2 * SizeOfC) {
-            Ancestor[c] = s;
-            Child[s] = ChildOfC;
-        } else {
-            Size[c] = SizeOfS;
-            Ancestor[s] = c;
-            s = c;
-        }
-    }
-    // Step 2.
-    Label[s] = LabelOfW;
-    // Step 3.
-    int SizeOfW = Size[w];
-    int& SizeOfV = Size[v];
-    SizeOfV += SizeOfW;
-    // Step 4.
-    if (SizeOfV < 2 * SizeOfW) {
-        leda::node& ChildOfV = Child[v];
-        leda::node Former = ChildOfV;
-        ChildOfV = s;
-        s = Former;
-    }
-    // Step 5.
-    while (s != n0) {
-        Ancestor[s] = v;
-        s = Child[s];
-    }
+    // Steps 1 and 4 to 7.
+    DominatorSearch(*this, ComponentNodes.size()).run(r, Idom);
 }
 
 int ZfCControlFlowGraph::buildDominatorTrees(leda::array<ZfCDominatorTree*>& DominatorTree) {

@@ -7,12 +7,12 @@ ZfCPropagationState::ZfCPropagationState(Graph& Of, bool SSAEdgesAreComplete)
       m_Edges(Of.max_edge_index() + 1) {
     for (leda::node v = Of.first_node(); v != Of.stop_node(); v = Of.next_node(v)) {
         if (Of.inf(v)->isBasicBlock() != nullptr) {
-            m_Nodes[v->index()].IsBlock = true;
+            m_Nodes[m_Graph.index(v)].IsBlock = true;
             ++m_Blocks;
         }
     }
     for (leda::edge e = Of.first_edge(); e != Of.stop_edge(); e = Of.next_edge(e)) {
-        m_Edges[e->index()] = Of.inf(e)->isSSAEdge() != nullptr ? IsSSA : 0;
+        m_Edges[m_Graph.index(e)] = Of.inf(e)->isSSAEdge() != nullptr ? IsSSA : 0;
     }
 }
 
@@ -27,7 +27,7 @@ void ZfCPropagationState::beginIteration() {
 }
 
 bool ZfCPropagationState::arriveAt(leda::node v) {
-    Node& Known = m_Nodes[v->index()];
+    Node& Known = m_Nodes[m_Graph.index(v)];
     if (Known.IsVisited) {
         return false;
     }
@@ -37,7 +37,7 @@ bool ZfCPropagationState::arriveAt(leda::node v) {
 }
 
 bool ZfCPropagationState::takeDirty(leda::node v) {
-    Node& Known = m_Nodes[v->index()];
+    Node& Known = m_Nodes[m_Graph.index(v)];
     const bool IsDirty = Known.IsDirty || !m_SkipsCleanNodes;
     Known.IsDirty = false;
     return IsDirty;
@@ -56,7 +56,7 @@ void ZfCPropagationState::markParametersDirty() {
 void ZfCPropagationState::take(leda::node v, int Position, leda::edge e,
                                leda::list<leda::edge>& CfgEdgeList) {
     CfgEdgeList.append(e);
-    Node& Known = m_Nodes[v->index()];
+    Node& Known = m_Nodes[m_Graph.index(v)];
     if (Position < s_MostRemembered) {
         Known.Taken = static_cast<unsigned char>(Known.Taken | (1U << Position));
     } else {
@@ -65,7 +65,7 @@ void ZfCPropagationState::take(leda::node v, int Position, leda::edge e,
 }
 
 void ZfCPropagationState::takeAgain(leda::node v, leda::list<leda::edge>& CfgEdgeList) {
-    unsigned int Taken = m_Nodes[v->index()].Taken;
+    unsigned int Taken = m_Nodes[m_Graph.index(v)].Taken;
     for (leda::edge e = m_Graph.first_adj_edge(v); Taken != 0; e = m_Graph.adj_succ(e)) {
         if (isSSAEdge(e)) {
             continue;
@@ -106,7 +106,7 @@ void ZfCPropagationState::forget(leda::node v) {
     --m_Blocks;
     for (leda::edge e = m_Graph.first_in_edge(v); e != nullptr; e = m_Graph.in_succ(e)) {
         if (!isSSAEdge(e)) {
-            Node& Before = m_Nodes[m_Graph.source(e)->index()];
+            Node& Before = m_Nodes[m_Graph.index(m_Graph.source(e))];
             Before.IsDescribed = false;
             Before.IsDirty = true;
         }

@@ -36,22 +36,22 @@ public:
 
     // ---- nodes ----
 
-    bool isVisited(leda::node v) const { return m_Nodes[v->index()].IsVisited; }
+    bool isVisited(leda::node v) const { return m_Nodes[m_Graph.index(v)].IsVisited; }
     // Marks a basic block as reached; true at the first arrival.
     bool arriveAt(leda::node v);
-    bool isBasicBlock(leda::node v) const { return m_Nodes[v->index()].IsBlock; }
+    bool isBasicBlock(leda::node v) const { return m_Nodes[m_Graph.index(v)].IsBlock; }
     bool isPhiFunction(leda::node v) { return described(v).IsPhi; }
     // The one control flow out-edge; null if there is none or more than one.
     leda::edge onlyCfgOutEdge(leda::node v) { return described(v).pOnlyOut; }
     // Whether a visit could find anything new. Taking the mark away comes before the visit, which
     // may set it again.
     bool takeDirty(leda::node v);
-    void markDirty(leda::node v) { m_Nodes[v->index()].IsDirty = true; }
+    void markDirty(leda::node v) { m_Nodes[m_Graph.index(v)].IsDirty = true; }
     // The definitions that hang on the calls, not on their operands alone.
     void markParametersDirty();
 
     // The visit appends control flow out-edges: from here on they are remembered.
-    void beginBranch(leda::node v) { m_Nodes[v->index()].Taken = 0; }
+    void beginBranch(leda::node v) { m_Nodes[m_Graph.index(v)].Taken = 0; }
     // Appends the CFG out-edge at that place among them, and remembers that.
     void take(leda::node v, int Position, leda::edge e, leda::list<leda::edge>& CfgEdgeList);
     // Appends what the last visit appended.
@@ -63,10 +63,12 @@ public:
 
     // ---- edges ----
 
-    bool isSSAEdge(leda::edge e) const { return (m_Edges[e->index()] & IsSSA) != 0; }
-    bool isExecutable(leda::edge e) const { return (m_Edges[e->index()] & IsExecutable) != 0; }
+    bool isSSAEdge(leda::edge e) const { return (m_Edges[m_Graph.index(e)] & IsSSA) != 0; }
+    bool isExecutable(leda::edge e) const {
+        return (m_Edges[m_Graph.index(e)] & IsExecutable) != 0;
+    }
     bool hasSSAInEdge(leda::node v) const;
-    void setExecutable(leda::edge e) { m_Edges[e->index()] |= IsExecutable; }
+    void setExecutable(leda::edge e) { m_Edges[m_Graph.index(e)] |= IsExecutable; }
 
     // ---- removal ----
 
@@ -91,7 +93,7 @@ private:
     static constexpr int s_MostRemembered = 8; // bits of Taken
 
     Node& described(leda::node v) {
-        Node& Known = m_Nodes[v->index()];
+        Node& Known = m_Nodes[m_Graph.index(v)];
         if (!Known.IsDescribed)
             describe(v, Known);
         return Known;

@@ -1,0 +1,1 @@
+#include "LEDA/leda.h"

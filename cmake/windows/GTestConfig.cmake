@@ -1,0 +1,13 @@
+# googletest from its sources, as a static library of this build. The caller's choice for its own libraries is left alone.
+set(KIND_OF_CALLER ${BUILD_SHARED_LIBS})
+set(BUILD_SHARED_LIBS OFF)
+set(INSTALL_GTEST OFF)
+set(BUILD_GMOCK OFF)
+if(NOT TARGET gtest)
+  add_subdirectory(/usr/src/googletest ${PROJECT_BINARY_DIR}/googletest EXCLUDE_FROM_ALL)
+endif()
+if(NOT TARGET GTest::gtest_main)
+  add_library(GTest::gtest ALIAS gtest)
+  add_library(GTest::gtest_main ALIAS gtest_main)
+endif()
+set(BUILD_SHARED_LIBS ${KIND_OF_CALLER})
