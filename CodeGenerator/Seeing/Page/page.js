@@ -74,7 +74,7 @@ function rangeText(found) {
     case "range": return numberText(found[1]) + " … " + numberText(found[2]);
     case "anything": return "anything";
     case "undetermined": return "undetermined";
-    default: return "–";
+    default: return "unknown";
   }
 }
 
