@@ -17,6 +17,7 @@ void Recorder::beforeAll(ProgramGraph& Graph) {
     m_Recording.Snapshots.emplace_back().Pass = "asBuilt";
     m_Recording.Snapshots.back().Purpose = "the program as it was written";
     takeSnapshot();
+    noteWrittenPlaces();
     explainVariables(m_Recording, Graph);
     m_Recording.CodeBefore = emitProgram(Graph).Source;
 }
@@ -54,6 +55,20 @@ Recording& Recorder::finish() {
 
 void Recorder::takeSnapshot() {
     m_pReader->readSnapshot(m_Recording.Snapshots.back());
+}
+
+// Where the text assigns and reads each variable. Only as it was built each place is there once.
+void Recorder::noteWrittenPlaces() {
+    for (const RecordedStatement& State : m_Recording.Statements) {
+        if (State.MakesCode && State.Variable >= 0 && State.Place.isKnown())
+            m_Recording.Variables[static_cast<std::size_t>(State.Variable)].Definitions.push_back(
+                State.Place);
+        for (const RecordedRead& Read : State.Reads) {
+            if (State.MakesCode && Read.Variable >= 0)
+                m_Recording.Variables[static_cast<std::size_t>(Read.Variable)].Uses.push_back(
+                    Read.Place);
+        }
+    }
 }
 
 // A version's definition is the last state that a statement has had: the code that later passes

@@ -30,6 +30,7 @@ public:
 
 private:
     void takeSnapshot();
+    void noteWrittenPlaces();
     void noteDefinitions();
 
     const SourceFiles& m_Sources;

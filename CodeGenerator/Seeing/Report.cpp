@@ -2,6 +2,8 @@
 
 #include "Seeing/ReportData.h"
 
+#include <map>
+
 namespace hpn {
 
 extern const char* const ReportTemplate;
@@ -33,28 +35,25 @@ std::string escape(const std::string& Text) {
     return Result;
 }
 
-std::string dataElements(const Recording& Of, const PictureLimits& Limits) {
+std::string dataElements(const std::vector<ReportPart>& Parts, bool AreLater) {
     std::string Text;
-    for (const auto& [Name, Json] : writeReportData(Of, drawPictures(Of, Limits)))
-        Text +=
-            "<script type=\"application/json\" id=\"data-" + Name + "\">" + Json + "</script>\n";
+    for (const ReportPart& Each : Parts) {
+        if (Each.IsLater == AreLater)
+            Text += "<script type=\"application/json\" id=\"data-" + Each.Name + "\">" + Each.Json +
+                    "</script>\n";
+    }
     return Text;
-}
-
-// The text of one place holder of the template.
-std::string fill(const std::string& Name, const Recording& Of, const PictureLimits& Limits) {
-    if (Name == "TITLE")
-        return escape(Of.Program);
-    if (Name == "STYLE")
-        return ReportStyle;
-    if (Name == "DATA")
-        return dataElements(Of, Limits);
-    return ReportScript;
 }
 
 } // namespace
 
 std::string makeReport(const Recording& Of, const PictureLimits& Limits) {
+    const std::vector<ReportPart> Parts = writeReportData(Of, drawPictures(Of, Limits));
+    const std::map<std::string, std::string> Texts = {{"TITLE", escape(Of.Program)},
+                                                      {"STYLE", ReportStyle},
+                                                      {"DATA", dataElements(Parts, false)},
+                                                      {"SCRIPT", ReportScript},
+                                                      {"LATER", dataElements(Parts, true)}};
     const std::string Template = ReportTemplate;
     std::string Page;
     std::size_t Done = 0;
@@ -62,7 +61,7 @@ std::string makeReport(const Recording& Of, const PictureLimits& Limits) {
          Open = Template.find("@{", Done)) {
         const std::size_t Close = Template.find('}', Open);
         Page += Template.substr(Done, Open - Done);
-        Page += fill(Template.substr(Open + 2, Close - Open - 2), Of, Limits);
+        Page += Texts.at(Template.substr(Open + 2, Close - Open - 2));
         Done = Close + 1;
     }
     return Page + Template.substr(Done);

@@ -256,28 +256,35 @@ private:
         --m_Alive;
     }
 
-    // Stretches without marks become one item; if that leaves too many, the middle goes too.
+    // Neighbours that are folded become one item, stretches without marks too; if that leaves too
+    // many, the middle goes as well.
     void foldItems(ReportBox& Box) {
+        foldWhere(Box, [](const ReportItem&, std::size_t) { return false; });
         const std::size_t Count = Box.Items.size();
-        if (Count <= m_Limits.Items / 2)
-            return;
-        std::vector<ReportItem> Kept;
-        for (std::size_t i = 0; i < Count; ++i) {
-            const bool IsEdge = i < 2 || i + 2 >= Count;
-            if (IsEdge || (!Box.Items[i].IsFolded && isMarked(Box.Items[i].Nodes.front())))
-                Kept.push_back(std::move(Box.Items[i]));
-            else
-                appendFolded(Kept, Box.Items[i]);
+        if (Count > m_Limits.Items / 2) {
+            foldWhere(Box, [this, Count](const ReportItem& Item, std::size_t At) {
+                return At >= 2 && At + 2 < Count && !isMarked(Item.Nodes.front());
+            });
         }
-        if (Kept.size() > m_Limits.Items) {
-            std::vector<ReportItem> Shown;
-            for (std::size_t i = 0; i < Kept.size(); ++i) {
-                if (i < m_Limits.Items / 2 || i + m_Limits.Items / 2 >= Kept.size())
-                    Shown.push_back(std::move(Kept[i]));
-                else
-                    appendFolded(Shown, Kept[i]);
-            }
-            Kept = std::move(Shown);
+        const std::size_t Half = m_Limits.Items / 2;
+        const std::size_t Left = Box.Items.size();
+        if (Left > m_Limits.Items) {
+            foldWhere(Box, [Half, Left](const ReportItem&, std::size_t At) {
+                return At >= Half && At + Half < Left;
+            });
+        }
+        for (ReportItem& Each : Box.Items)
+            Each.IsFolded = Each.IsFolded && Each.Nodes.size() > 1;
+    }
+
+    template <class Condition>
+    static void foldWhere(ReportBox& Box, Condition IsFoldedToo) {
+        std::vector<ReportItem> Kept;
+        for (std::size_t i = 0; i < Box.Items.size(); ++i) {
+            if (Box.Items[i].IsFolded || IsFoldedToo(Box.Items[i], i))
+                appendFolded(Kept, Box.Items[i]);
+            else
+                Kept.push_back(std::move(Box.Items[i]));
         }
         Box.Items = std::move(Kept);
     }

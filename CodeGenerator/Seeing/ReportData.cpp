@@ -124,26 +124,24 @@ Json nodes(const Recording& Of) {
 }
 
 // SSA edges of most states are the same as in the state before: each list is stored once.
-Json procedures(const Recording& Of) {
-    Json Lists = Json::array();
+Json procedures(const Recording& Of, Json& SsaLists) {
+    SsaLists = Json::array();
     std::unordered_map<std::string, std::size_t> Known; // looked up only
-    Json Table = table({"name", "title", "place", "nodes", "ssa", "callCount"}, Of.Procedures,
-                       [&Lists, &Known](const RecordedProcedure& Each) {
-                           Json Edges = Json::array();
-                           for (const RecordedEdge& Edge : Each.Edges) {
-                               if (Edge.What != RecordedEdge::Kind::Ssa)
-                                   continue;
-                               Edges.push_back(Edge.From);
-                               Edges.push_back(Edge.To);
-                           }
-                           const auto [Found, IsNew] = Known.emplace(Edges.dump(), Lists.size());
-                           if (IsNew)
-                               Lists.push_back(std::move(Edges));
-                           return Json::array({Each.Name, Each.Title, place(Each.Place), Each.Nodes,
-                                               Found->second, Each.Calls.size()});
-                       });
-    Table["ssaLists"] = std::move(Lists);
-    return Table;
+    return table({"name", "title", "place", "nodes", "ssa"}, Of.Procedures,
+                 [&SsaLists, &Known](const RecordedProcedure& Each) {
+                     Json Edges = Json::array();
+                     for (const RecordedEdge& Edge : Each.Edges) {
+                         if (Edge.What != RecordedEdge::Kind::Ssa)
+                             continue;
+                         Edges.push_back(Edge.From);
+                         Edges.push_back(Edge.To);
+                     }
+                     const auto [Found, IsNew] = Known.emplace(Edges.dump(), SsaLists.size());
+                     if (IsNew)
+                         SsaLists.push_back(std::move(Edges));
+                     return Json::array(
+                         {Each.Name, Each.Title, place(Each.Place), Each.Nodes, Found->second});
+                 });
 }
 
 Json snapshots(const Recording& Of) {
@@ -202,7 +200,7 @@ Json layout(const PlacedPicture& Picture) {
         Boxes.push_back({Each.X, Each.Y, Each.Width, Each.Height});
     Json Edges = Json::array();
     for (const PlacedPicture::Edge& Each : Picture.Edges)
-        Edges.push_back(Json::array({std::string(1, Each.What), Each.Path}));
+        Edges.push_back(Json::array({Each.From, Each.To, std::string(1, Each.What), Each.Path}));
     return {{"width", Picture.Width},
             {"height", Picture.Height},
             {"boxes", std::move(Boxes)},
@@ -225,9 +223,6 @@ Json picture(const ReportPicture& Picture) {
 }
 
 Json pictures(const ReportPictures& Pictures) {
-    Json Layouts = Json::array();
-    for (const PlacedPicture& Each : Pictures.Layouts)
-        Layouts.push_back(layout(Each));
     Json Procedures = Json::array();
     for (const ReportPicture& Each : Pictures.Procedures)
         Procedures.push_back(picture(Each));
@@ -236,7 +231,6 @@ Json pictures(const ReportPictures& Pictures) {
         Calls.push_back(Each.Layout);
     return {{"isGraphvizThere", Pictures.IsGraphvizThere},
             {"leftOut", Pictures.LeftOut},
-            {"layouts", std::move(Layouts)},
             {"procedures", std::move(Procedures)},
             {"calls", std::move(Calls)}};
 }
@@ -255,30 +249,42 @@ std::string writeForPage(const Json& Value) {
     return Result;
 }
 
+class PartWriter {
+public:
+    void add(const std::string& Name, const Json& Value, bool IsLater = true) {
+        m_Parts.push_back({Name, writeForPage(Value), IsLater});
+    }
+    void addEarly(const std::string& Name, const Json& Value) { add(Name, Value, false); }
+    std::vector<ReportPart> take() { return std::move(m_Parts); }
+
+private:
+    std::vector<ReportPart> m_Parts;
+};
+
 } // namespace
 
-std::vector<std::pair<std::string, std::string>> writeReportData(const Recording& Of,
-                                                                 const ReportPictures& Pictures) {
-    std::vector<std::pair<std::string, std::string>> Parts;
-    const auto Add = [&Parts](const std::string& Name, const Json& Value) {
-        Parts.emplace_back(Name, writeForPage(Value));
-    };
-    Add("about", {{"program", Of.Program}, {"assumptions", Of.Assumptions}});
-    Add("sources", sources(Of));
-    Add("snapshots", snapshots(Of));
-    Add("pictures", pictures(Pictures));
-    Add("procedures", procedures(Of));
-    Add("nodes", nodes(Of));
-    Add("statements", statements(Of));
-    Add("variables", variables(Of));
-    Add("versions", versions(Of));
+std::vector<ReportPart> writeReportData(const Recording& Of, const ReportPictures& Pictures) {
+    PartWriter Writer;
+    Json SsaLists;
+    Writer.addEarly("about", {{"program", Of.Program}, {"assumptions", Of.Assumptions}});
+    Writer.addEarly("sources", sources(Of));
+    Writer.addEarly("snapshots", snapshots(Of));
     for (const RecordedSnapshot& Each : Of.Snapshots)
-        Add("changes-" + std::to_string(Each.Number), changes(Each));
-    Add("fates", fates(Of));
-    Add("saturations", saturations(Of));
-    Add("remarks", remarks(Of));
-    Add("code", {{"before", Of.CodeBefore}, {"after", Of.CodeAfter}});
-    return Parts;
+        Writer.addEarly("changes-" + std::to_string(Each.Number), changes(Each));
+    Writer.addEarly("pictures", pictures(Pictures));
+    for (std::size_t i = 0; i < Pictures.Layouts.size(); ++i)
+        Writer.addEarly("layout-" + std::to_string(i), layout(Pictures.Layouts[i]));
+    Writer.addEarly("procedures", procedures(Of, SsaLists));
+    Writer.addEarly("nodes", nodes(Of));
+    Writer.addEarly("statements", statements(Of));
+    Writer.add("ssa", SsaLists);
+    Writer.add("variables", variables(Of));
+    Writer.add("versions", versions(Of));
+    Writer.add("fates", fates(Of));
+    Writer.add("saturations", saturations(Of));
+    Writer.add("remarks", remarks(Of));
+    Writer.add("code", {{"before", Of.CodeBefore}, {"after", Of.CodeAfter}});
+    return Writer.take();
 }
 
 } // namespace hpn

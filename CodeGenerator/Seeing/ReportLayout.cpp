@@ -2,20 +2,25 @@
 
 #include <cmath>
 #include <cstdio>
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <sstream>
 
 #include <chrono>
+#include <random>
+#include <thread>
+
+#ifdef _WIN32
+#include <windows.h>
+#else
 #include <csignal>
 #include <fcntl.h>
 #include <spawn.h>
 #include <sys/wait.h>
-#include <thread>
 #include <unistd.h>
 
 extern char** environ;
+#endif
 
 namespace hpn {
 
@@ -75,10 +80,13 @@ class ScratchDirectory {
 public:
     ScratchDirectory() {
         std::error_code Error;
-        std::string Pattern =
-            (std::filesystem::temp_directory_path(Error) / "hpncg-XXXXXX").string();
-        if (!Error && mkdtemp(Pattern.data()) != nullptr)
-            m_Path = Pattern;
+        const std::filesystem::path Parent = std::filesystem::temp_directory_path(Error);
+        std::random_device Random;
+        for (int Attempt = 0; !Error && Attempt < 10 && m_Path.empty(); ++Attempt) {
+            const std::filesystem::path Path = Parent / ("hpncg-" + std::to_string(Random()));
+            if (std::filesystem::create_directory(Path, Error))
+                m_Path = Path.string();
+        }
     }
     ~ScratchDirectory() {
         std::error_code Error;
@@ -94,6 +102,46 @@ public:
 private:
     std::string m_Path;
 };
+
+#ifdef _WIN32
+
+HANDLE openInherited(const std::string& Name, DWORD Access, DWORD Disposition) {
+    SECURITY_ATTRIBUTES Inherited = {sizeof(SECURITY_ATTRIBUTES), nullptr, TRUE};
+    return CreateFileA(Name.c_str(), Access, FILE_SHARE_READ, &Inherited, Disposition,
+                       FILE_ATTRIBUTE_NORMAL, nullptr);
+}
+
+DotAnswer runProcess(const std::string& Input, const std::string& Output, double Seconds) {
+    STARTUPINFOA Start = {};
+    Start.cb = sizeof Start;
+    Start.dwFlags = STARTF_USESTDHANDLES;
+    Start.hStdInput = openInherited(Input, GENERIC_READ, OPEN_EXISTING);
+    Start.hStdOutput = openInherited(Output, GENERIC_WRITE, CREATE_ALWAYS);
+    Start.hStdError = openInherited("NUL", GENERIC_WRITE, OPEN_EXISTING);
+    std::string Command = "dot.exe -Tplain";
+    PROCESS_INFORMATION Process = {};
+    const bool IsStarted = CreateProcessA(nullptr, Command.data(), nullptr, nullptr, TRUE, 0,
+                                          nullptr, nullptr, &Start, &Process) != 0;
+    for (HANDLE Each : {Start.hStdInput, Start.hStdOutput, Start.hStdError})
+        CloseHandle(Each);
+    if (!IsStarted)
+        return DotAnswer::NotThere;
+    DWORD Status = 1;
+    const bool IsInTime =
+        WaitForSingleObject(Process.hProcess, static_cast<DWORD>(Seconds * 1000)) == WAIT_OBJECT_0;
+    if (!IsInTime) {
+        TerminateProcess(Process.hProcess, 1);
+        WaitForSingleObject(Process.hProcess, INFINITE);
+    }
+    GetExitCodeProcess(Process.hProcess, &Status);
+    CloseHandle(Process.hThread);
+    CloseHandle(Process.hProcess);
+    if (!IsInTime)
+        return DotAnswer::TooSlow;
+    return Status == 0 ? DotAnswer::Done : DotAnswer::Failed;
+}
+
+#else
 
 int startDot(const std::string& Input, const std::string& Output, pid_t& Process) {
     posix_spawn_file_actions_t Files;
@@ -124,6 +172,15 @@ DotAnswer waitFor(pid_t Process, double Seconds) {
     }
     return WIFEXITED(Status) && WEXITSTATUS(Status) == 0 ? DotAnswer::Done : DotAnswer::Failed;
 }
+
+DotAnswer runProcess(const std::string& Input, const std::string& Output, double Seconds) {
+    pid_t Process = 0;
+    if (startDot(Input, Output, Process) != 0)
+        return DotAnswer::NotThere;
+    return waitFor(Process, Seconds);
+}
+
+#endif
 
 } // namespace
 
@@ -174,10 +231,7 @@ DotAnswer runDot(const std::string& Dot, double Seconds, std::string& Plain) {
         return DotAnswer::Failed;
     if (!(std::ofstream(Scratch.file("in")) << Dot << std::flush))
         return DotAnswer::Failed;
-    pid_t Process = 0;
-    if (startDot(Scratch.file("in"), Scratch.file("out"), Process) != 0)
-        return DotAnswer::NotThere;
-    const DotAnswer Answer = waitFor(Process, Seconds);
+    const DotAnswer Answer = runProcess(Scratch.file("in"), Scratch.file("out"), Seconds);
     if (Answer != DotAnswer::Done)
         return Answer;
     std::ostringstream Text;

@@ -95,6 +95,7 @@ private:
             for (const RecordedChange& Each : m_Of.Snapshots[i].Changes)
                 Weights[Each.Procedure] += Each.What == RecordedChange::Kind::Added ? 1 : 4;
             std::vector<std::pair<std::size_t, std::string>> Ranking;
+            Ranking.reserve(Weights.size());
             for (const auto& [Name, Weight] : Weights)
                 Ranking.emplace_back(Weight, Name);
             std::sort(Ranking.rbegin(), Ranking.rend());

@@ -1,5 +1,5 @@
 "use strict";
-// Shows a recorded run. Each part of the data is read when a view first needs it. Numbers that name things are as in the
+// Shows a recorded run. Each part of the data is read when a view first needs it; the later parts stand behind this script. Numbers that name things are as in the
 // recording: an index is a place in a table, an id stays with a node or statement through all snapshots.
 (() => {
 
@@ -21,7 +21,6 @@ function toObjects(raw) {
     for (let i = 0; i < count; ++i) object[columns[i]] = row[i];
     return object;
   });
-  if (raw.ssaLists) objects.ssaLists = raw.ssaLists;
   if (raw.marks) objects.marks = new Map(raw.marks);
   return objects;
 }
@@ -75,7 +74,7 @@ function rangeText(found) {
     case "range": return numberText(found[1]) + " … " + numberText(found[2]);
     case "anything": return "anything";
     case "undetermined": return "undetermined";
-    default: return "–";
+    default: return "unknown";
   }
 }
 
@@ -89,20 +88,30 @@ function make(tag, attributes, ...children) {
     if (name.startsWith("on")) element.addEventListener(name.slice(2), value);
     else if (value !== null && value !== undefined && value !== false) element.setAttribute(name, value);
   }
-  for (const child of children.flat()) {
+  for (const child of children.flat(Infinity)) {
     if (child !== null && child !== undefined && child !== "") element.append(child);
   }
   return element;
 }
 
 const byId = (id) => document.getElementById(id);
+
+function fill(element, ...children) {
+  element.replaceChildren(...children.flat(Infinity).filter((child) => child !== null && child !== undefined && child !== ""));
+}
+
 const escapeText = (text) => text.replace(/&/g, "&amp;").replace(/</g, "&lt;").replace(/>/g, "&gt;").replace(/"/g, "&quot;");
 const code = (text) => make("code", {}, text);
 const chip = (kind, text) => make("span", { class: "chip " + kind }, text ?? kind);
 
-function lineLink(place) {
+function lineLink(place, isShort) {
   if (!place) return "";
-  return make("button", { type: "button", class: "go", "data-line": lineOf(place) }, "line " + lineTitle(lineOf(place)));
+  return make("button", { type: "button", class: "go", "data-line": lineOf(place) }, (isShort ? "" : "line ") + lineTitle(lineOf(place)));
+}
+
+// Texts of the recording quote code in backticks.
+function prose(text) {
+  return make("span", {}, text.split("`").map((piece, i) => i % 2 ? code(piece) : piece));
 }
 
 function variableLink(index, text) {
@@ -153,7 +162,7 @@ function sortedTable({ columns, rows, tools, accepts, hint, label }) {
       if ((!accepts || accepts(row)) && words.every((word) => texts[i].includes(word))) chosen.push(i);
     });
     if (column >= 0) chosen.sort(compare);
-    body.replaceChildren(...chosen.slice(0, limit).map((i) => make("tr", {}, columns.map((each) =>
+    fill(body, ...chosen.slice(0, limit).map((i) => make("tr", {}, columns.map((each) =>
       make("td", { class: each.figure ? "figure" : each.code ? "code" : null }, (each.cell || each.value)(rows[i]))))));
     count.textContent = chosen.length === rows.length ? `${rows.length} rows` : `${chosen.length} of ${rows.length} rows`;
     more.hidden = chosen.length <= limit;
@@ -223,7 +232,7 @@ function markSource() {
 
 // ---- what is chosen --------------------------------------------------------------------------------------------------
 
-const chosen = { line: 0, node: -1 };
+const chosen = { line: 0, node: -1, ids: new Set() };
 
 function chooseLine(line, isFromPicture) {
   chosen.line = line;
@@ -258,20 +267,20 @@ function inspectLine(line) {
   const ids = [...new Set(states.map((each) => each.id))];
   const remarks = (remarksOnLine().get(line) || []).map((index) => data("remarks")[index]);
   const declared = data("variables").map((each, index) => [each, index]).filter(([each]) => lineOf(each.place) === line && !each.isHidden);
-  byId("inspector").replaceChildren(
+  fill(byId("inspector"),
     make("h2", {}, "Line " + lineTitle(line), byId("view-passes").hidden && ids.length
       ? make("button", { type: "button", style: "float:right;font-weight:400;font-size:12px", onclick: () => { openView("passes"); showLineInPictures(line); } }, "show in the graph") : ""),
     ...declared.map(([each, index]) => make("div", {}, "declares ", variableLink(index, variableName(each)), " ", code(rangeText(each.found)))),
     ...ids.map(aboutStatement),
     remarks.length ? make("h3", {}, "Remarks") : "",
-    make("ul", {}, remarks.map((each) => make("li", {}, each.text, " ", make("span", { class: "soft" }, each.pass)))),
+    make("ul", {}, remarks.map((each) => make("li", {}, prose(each.text), " ", make("span", { class: "soft" }, each.pass)))),
     ids.length || declared.length || remarks.length ? "" : make("p", { class: "empty" }, "Nothing of the graph begins on this line."));
   byId("inspector").scrollTop = 0;
 }
 
 function inspectNode(node) {
   const ids = [...new Set(node.statements.map((index) => data("statements")[index].id))];
-  byId("inspector").replaceChildren(
+  fill(byId("inspector"),
     make("h2", {}, `Node ${node.id}`, node.kind === "block" ? "" : ` (${node.kind})`),
     node.place ? make("div", {}, lineLink(node.place)) : "",
     ...ids.slice(0, 40).map(aboutStatement),
@@ -282,7 +291,7 @@ function inspectNode(node) {
 
 function inspectFolded(indices) {
   const lines = [...new Set(indices.map((index) => lineOf(data("nodes")[index].place)).filter(Boolean))].sort((a, b) => a - b);
-  byId("inspector").replaceChildren(make("h2", {}, `${indices.length} nodes, folded`),
+  fill(byId("inspector"), make("h2", {}, `${indices.length} nodes, folded`),
     make("ul", {}, lines.slice(0, 200).map((line) => make("li", {}, make("button", { type: "button", class: "go", "data-line": line },
       "line " + lineTitle(line)), " ", code((byId("line-" + line)?.lastChild.textContent || "").trim())))));
 }
@@ -296,7 +305,7 @@ function aboutStatement(id) {
   for (const index of fatesOfStatement().get(id) || []) {
     const fate = data("fates")[index];
     lines.push(make("div", {}, fate.isRemoved ? chip("removed") : chip(fate.looksUnused ? "warn" : "good", "stays"), " ",
-      fate.isRemoved ? ["by ", passLink(fate.snapshot), ": "] : "", fate.why + " ", fate.because ? lineLink(fate.because) : ""));
+      fate.isRemoved ? ["by ", passLink(fate.snapshot), ": "] : "", prose(fate.why), " ", fate.because ? lineLink(fate.because) : ""));
   }
   for (const index of saturationsOfStatement().get(id) || []) lines.push(saturationText(data("saturations")[index]));
   for (const index of (versionsOfStatement().get(id) || []).slice(0, 6)) {
@@ -315,22 +324,26 @@ function saturationText(each) {
   return make("div", {}, "saturates ", sides, make("span", { class: "soft" }, "(brings " + rangeText(each.value) + ")"));
 }
 
-// Follows the explanation of a version through the versions it names, each one once.
+// Follows the explanation of a version through the versions it names, each one once: a line that names a version gives way to
+// what that one says of itself.
 function explanation(index) {
-  const tree = make("div", { class: "tree" });
-  const told = new Set([index]);
-  const pending = data("versions")[index].explanation.map((reason) => [reason, 0]).reverse();
+  const tree = make("div", { class: "tree" }), told = new Set(), pending = [];
+  const tell = (version, depth) => {
+    told.add(version);
+    const reasons = data("versions")[version].explanation;
+    for (let i = reasons.length - 1; i >= 0; --i) pending.push([reasons[i], i ? depth + 1 : depth]);
+  };
+  tell(index, 0);
   let count = 0;
   while (pending.length && count < 200) {
     const [[text, place, next], depth] = pending.pop();
+    if (next >= 0 && !told.has(next)) {
+      tell(next, depth);
+      continue;
+    }
     ++count;
-    const goesOn = next >= 0 && !told.has(next);
-    tree.append(make("div", { style: `padding-left:${Math.min(depth, 14) * 14}px`, class: goesOn || next >= 0 ? null : "leaf" },
-      text + " ", lineLink(place)));
-    if (!goesOn) continue;
-    told.add(next);
-    const further = data("versions")[next].explanation;
-    for (let i = further.length - 1; i >= 0; --i) pending.push([further[i], depth + 1]);
+    tree.append(make("div", { style: `padding-left:${Math.min(depth, 14) * 14}px` },
+      prose(text), next >= 0 ? make("span", { class: "soft" }, " (see above)") : "", " ", lineLink(place)));
   }
   if (pending.length) tree.append(make("div", { class: "soft" }, "… the chain goes on"));
   return tree;
@@ -349,7 +362,7 @@ function timeText(seconds) {
 function showTimeline() {
   const snapshots = data("snapshots");
   const mostChanges = Math.max(1, ...snapshots.map(totalOf)), mostTime = Math.max(1e-9, ...snapshots.map((each) => each.seconds));
-  byId("timeline").replaceChildren(...snapshots.map((each) => {
+  fill(byId("timeline"), ...snapshots.map((each) => {
     const total = totalOf(each), height = total ? 4 + 30 * Math.sqrt(total / mostChanges) : 0;
     const bars = Object.entries(each.tally).filter(([, count]) => count).map(([kind, count]) =>
       make("span", { class: "bar-" + kind, style: `height:${(height * count / total).toFixed(1)}px` }));
@@ -366,11 +379,12 @@ const findProcedure = (snapshot, name) => snapshot.procedures.find((index) => da
 
 function choosePass(number, line) {
   view.pass = number;
+  changeAt = -1;
   const snapshot = snapshotAfter();
   document.querySelectorAll("#timeline button").forEach((each, i) => each.setAttribute("aria-selected", i === number));
   const tally = Object.entries(snapshot.tally).filter(([, count]) => count);
-  byId("pass-about").replaceChildren(make("b", {}, snapshot.pass), ": " + snapshot.purpose + ". ", tally.map(([kind, count]) => [chip(kind, `${count} ${kind}`), " "]),
-    make("span", { class: "soft" }, `${snapshot.nodeCount} nodes, ${snapshot.statementCount} statements, ${snapshot.conditionCount} conditions afterwards; ${timeText(snapshot.seconds)}`));
+  fill(byId("pass-about"), make("b", {}, snapshot.pass), ": " + snapshot.purpose + ". ", tally.map(([kind, count]) => [chip(kind, `${count} ${kind}`), " "]),
+    make("span", { class: "soft" }, `${snapshot.nodeCount} nodes, ${snapshot.statementCount} statements after it`));
   fillProcedures();
   if (line) chooseProcedureOfLine(line);
   showPictures();
@@ -385,7 +399,7 @@ function fillProcedures() {
     for (const index of snapshot.procedures) names.set(data("procedures")[index].name, data("procedures")[index].title);
   const listed = [...names].sort((a, b) => (changed.get(b[0]) || 0) - (changed.get(a[0]) || 0));
   const select = byId("procedure");
-  select.replaceChildren(...listed.map(([name, title]) => make("option", { value: name }, title + (changed.get(name) ? ` (${changed.get(name)} changed)` : ""))),
+  fill(select, ...listed.map(([name, title]) => make("option", { value: name }, title + (changed.get(name) ? ` (${changed.get(name)} changed)` : ""))),
     make("option", { value: "*calls" }, "whole program: calls"));
   if (!names.has(view.procedure) && view.procedure !== "*calls") view.procedure = listed[0][0];
   select.value = view.procedure;
@@ -396,7 +410,7 @@ function showPictures() {
   const boxes = [["before", snapshotBefore()], ["after", snapshotAfter()]];
   for (const [side, snapshot] of boxes) {
     const title = snapshot.number ? "after " + snapshot.number + " " + snapshot.pass : "as built";
-    byId("caption-" + side).textContent = (side === "before" ? "before: " : isFirst ? "" : "after: ") + title;
+    byId("caption-" + side).textContent = side === "before" ? `before (${title})` : title;
     byId(side).closest("figure").hidden = isFirst && side === "before";
     view[side] = isFirst && side === "before" ? null : drawSide(byId(side), snapshot, side);
   }
@@ -409,15 +423,15 @@ function drawSide(element, snapshot, side) {
   const index = view.procedure === "*calls" ? -1 : findProcedure(snapshot, view.procedure);
   const picture = view.procedure === "*calls" ? { layout: data("pictures").calls[snapshot.number] } : index < 0 ? null : data("pictures").procedures[index];
   if (!picture || picture.layout < 0) {
-    element.replaceChildren(make("p", {}, whyNoPicture(picture)));
+    fill(element, make("p", {}, whyNoPicture(picture)));
     return null;
   }
-  const layout = data("pictures").layouts[picture.layout];
-  const scene = { element, layout, rows: new Map(), lines: new Map(), marked: [], x: 0, y: 0, scale: 1, index, side };
+  const layout = data("layout-" + picture.layout);
+  const scene = { element, layout, rows: new Map(), lines: new Map(), marked: [], boxes: [], x: 0, y: 0, scale: 1, index, side };
   const body = index < 0 ? drawCalls(layout, snapshot) : drawBoxes(scene, layout, picture, snapshot, side);
   element.innerHTML = `<svg role="img" aria-label="graph ${side}"><defs>${["f", "t", "n"].map((kind) =>
     `<marker id="tip-${side}-${kind}" viewBox="0 0 10 10" refX="0" refY="5" markerWidth="7" markerHeight="7" markerUnits="userSpaceOnUse" orient="auto"><path class="tip ${kind}" d="M0,1L10,5L0,9z"/></marker>`).join("")}</defs><g class="world">` +
-    layout.edges.map(([kind, path]) => `<path class="way ${kind}" d="${path}" marker-end="url(#tip-${side}-${kind})"/>`).join("") + body + '<g class="overlay"></g></g></svg>';
+    layout.edges.map(([, , kind, path]) => `<path class="way ${kind}" d="${path}" marker-end="url(#tip-${side}-${kind})"/>`).join("") + body + '<g class="overlay"></g></g></svg>';
   if (picture.isFolded) byId("caption-" + side).textContent += " (over 1,000 nodes: folded)";
   return scene;
 }
@@ -457,6 +471,7 @@ function drawBoxes(scene, layout, picture, snapshot, side) {
   layout.boxes.forEach(([x, y, width, height], boxIndex) => {
     pieces.push(`<rect class="box" x="${x}" y="${y}" width="${width}" height="${height}" rx="3"/>`);
     let top = y + 4;
+    const ids = scene.boxes[boxIndex] = [];
     picture.boxes[boxIndex].forEach((item, i) => {
       if (i) pieces.push(`<line class="rule" x1="${x}" x2="${x + width}" y1="${top}" y2="${top}"/>`);
       const rows = Array.isArray(item) ? [{ text: `⋯ ${item.length} nodes`, isVirtual: true }] : rowsOf(nodes[item]);
@@ -469,6 +484,7 @@ function drawBoxes(scene, layout, picture, snapshot, side) {
         const mark = marks.get(nodes[item].id) || "";
         pieces.push(`<g class="row ${mark}" data-node="${item}" data-id="${nodes[item].id}">`);
         scene.rows.set(nodes[item].id, at);
+        ids.push(nodes[item].id);
         noteLines(scene, nodes[item], at);
         if (mark) scene.marked.push(item);
       }
@@ -512,10 +528,14 @@ function drawCalls(layout, snapshot) {
 function drawSsa() {
   for (const scene of [view.before, view.after]) {
     if (!scene || scene.index < 0) continue;
-    const procedures = data("procedures"), list = procedures.ssaLists[procedures[scene.index].ssa];
+    if (!chosen.ids.size && !byId("ssa").checked) {
+      scene.element.querySelector(".overlay").replaceChildren();
+      continue;
+    }
+    const list = data("ssa")[data("procedures")[scene.index].ssa];
     let text = "";
     for (let i = 0; i + 1 < list.length; i += 2) {
-      const isNear = chosen.node >= 0 && (list[i] === chosen.node || list[i + 1] === chosen.node);
+      const isNear = chosen.ids.has(list[i]) || chosen.ids.has(list[i + 1]);
       if (!isNear && !byId("ssa").checked) continue;
       const from = scene.rows.get(list[i]), to = scene.rows.get(list[i + 1]);
       if (from && to) text += `<path class="ssa${isNear ? " near" : ""}" d="${ssaPath(from, to)}" marker-end="url(#tip-${scene.side}-f)"/>`;
@@ -557,12 +577,11 @@ function bringToSight(scene, at, scale) {
 
 // What fits stays whole; of anything larger the first change is shown, readable.
 function startPosition() {
-  for (const scene of scenes()) {
-    fit(scene);
-    if (scene.scale >= 0.6) continue;
-    const first = scene.marked.length ? scene.rows.get(data("nodes")[scene.marked[0]].id) : null;
+  scenes().forEach(fit);
+  const large = scenes().filter((scene) => scene.index >= 0 && scene.scale < 0.6), first = changedNodes()[0];
+  for (const scene of large) {
     const [x, y, width] = scene.layout.boxes[0];
-    bringToSight(scene, first || { x, y, width }, 0.85);
+    bringToSight(scene, (first === undefined ? null : placeNear(scene, data("nodes")[first].id)) || { x, y, width }, 0.85);
   }
   if (chosen.line || chosen.node >= 0) markChosen();
 }
@@ -591,19 +610,49 @@ function pan(scene, x, y) {
 
 let changeAt = -1;
 function nextChange(step) {
-  const scene = scenes().reverse().find((each) => each.marked.length);
-  if (!scene) return;
-  changeAt = (changeAt + step + scene.marked.length) % scene.marked.length;
-  const index = scene.marked[changeAt % scene.marked.length];
+  const nodes = changedNodes();
+  if (!nodes.length) return;
+  changeAt = changeAt < 0 && step < 0 ? nodes.length - 1 : (changeAt + step + nodes.length) % nodes.length;
+  const index = nodes[changeAt];
   chooseNode(index);
   bringBothToSight(data("nodes")[index].id);
 }
 
 function bringBothToSight(id) {
   for (const scene of scenes()) {
-    const at = scene.rows.get(id);
+    const at = placeNear(scene, id);
     if (at) bringToSight(scene, at);
   }
+}
+
+// Marked nodes of both sides, first those that have gone.
+function changedNodes() {
+  const nodes = new Map();
+  for (const scene of scenes())
+    for (const index of scene.marked) if (!nodes.has(data("nodes")[index].id)) nodes.set(data("nodes")[index].id, index);
+  return [...nodes.values()];
+}
+
+// Where a node stands, or on the side that lacks it the nearest one on the way to it.
+function placeNear(scene, id) {
+  if (scene.rows.has(id)) return scene.rows.get(id);
+  const other = scenes().find((each) => each !== scene && each.rows.has(id));
+  if (!other) return null;
+  const first = other.boxes.findIndex((ids) => ids.includes(id)), seen = new Set([first]), pending = [first];
+  const common = (ids) => scene.rows.get(ids.filter((each) => scene.rows.has(each)).pop());
+  const before = common(other.boxes[first].slice(0, other.boxes[first].indexOf(id)));
+  if (before) return before;
+  while (pending.length) {
+    const box = pending.shift();
+    for (const [from, to] of other.layout.edges) {
+      if (to !== box || seen.has(from)) continue;
+      const found = common(other.boxes[from]);
+      if (found) return found;
+      seen.add(from);
+      pending.push(from);
+    }
+  }
+  return null;
 }
 
 function listenToPicture(side) {
@@ -657,9 +706,13 @@ function keyInPicture(event, side) {
 
 function markChosen() {
   document.querySelectorAll(".picture .chosen").forEach((each) => each.classList.remove("chosen"));
+  chosen.ids.clear();
   for (const scene of scenes()) {
     const ids = chosen.node >= 0 ? [chosen.node] : (scene.lines.get(chosen.line) || []).map((each) => each.id);
-    for (const id of ids) scene.element.querySelector(`[data-id="${id}"]`)?.classList.add("chosen");
+    for (const id of ids) {
+      chosen.ids.add(id);
+      scene.element.querySelector(`[data-id="${id}"]`)?.classList.add("chosen");
+    }
   }
   drawSsa();
 }
@@ -700,21 +753,21 @@ function showLineInPictures(line) {
 
 function showChanges() {
   if (view.pass === 0) {
-    byId("changes").replaceChildren();
+    fill(byId("changes"));
     return;
   }
   const text = (index) => index < 0 ? "" : data("statements")[index].text;
   const placeOf = (each) => data("statements")[each.before >= 0 ? each.before : each.after]?.place || 0;
   const title = (name) => name.replace(/^#/, "");
-  byId("changes").replaceChildren(make("h3", {}, "What this pass changed"), sortedTable({
+  fill(byId("changes"), make("h3", {}, "What this pass changed"), sortedTable({
     label: "changes", hint: "filter the changes", rows: data("changes-" + view.pass),
     columns: [
       { title: "change", value: (each) => each.kind, cell: (each) => chip(each.kind) },
-      { title: "line", value: (each) => lineOf(placeOf(each)), cell: (each) => lineLink(placeOf(each)) },
+      { title: "line", value: (each) => lineOf(placeOf(each)), cell: (each) => lineLink(placeOf(each), true) },
       { title: "procedure", value: (each) => title(each.procedure) },
       { title: "before", value: (each) => text(each.before), code: true },
       { title: "after", value: (each) => text(each.after), code: true },
-      { title: "why", value: (each) => each.why }
+      { title: "why", value: (each) => each.why, cell: (each) => prose(each.why) }
     ] }));
 }
 
@@ -753,11 +806,10 @@ function fillVariables(section) {
       { title: "found", value: (each) => ["constant", "range"].includes(each.found[0]) ? asNumber(each.found[1]) : rangeText(each.found),
         cell: (each) => make("span", { title: each.notTracked || null }, rangeText(each.found), each.unit && ["constant", "range"].includes(each.found[0]) ? make("span", { class: "soft" }, " " + each.unit) : "") },
       { title: "starts as", value: (each) => each.kind === "input" ? NaN : asNumber(each.initial), cell: (each) => each.kind === "input" ? "–" : numberText(each.initial), figure: true },
-      { title: "versions", value: (each) => each.versions.length, figure: true },
       { title: "read", value: (each) => each.uses.length, figure: true },
       { title: "declared", value: (each) => lineOf(each.place), cell: (each) => places([each.place]) },
       { title: "defined in lines", value: (each) => each.definitions.length, cell: (each) => places(each.definitions) },
-      { title: "kept, or not tracked, because", value: (each) => [each.notTracked && "not tracked: " + each.notTracked, each.keptBecause].filter(Boolean).join("; ") }
+      { title: "kept / not tracked", value: (each) => [each.notTracked && "not tracked: " + each.notTracked, each.keptBecause].filter(Boolean).join("; ") }
     ] }));
 }
 
@@ -792,6 +844,7 @@ function rangeBar(each, verdict) {
   const label = (value, x, anchor) => `<text x="${x}%" y="30" text-anchor="${anchor}">${numberText(value)}</text>`;
   let text = `<svg role="img" aria-label="${escapeText(variableName(each) + " " + rangeText(each.found))}">`;
   text += isEndless ? '<rect class="none" x="1%" y="8" width="98%" height="10"/>' : '<rect class="track" x="1%" y="8" width="98%" height="10" rx="2"/>';
+  if (verdict.kind === "anything" && !isEndless) text += '<rect class="any" x="1%" y="8" width="98%" height="10" rx="2"/>';
   if (isKnown) {
     const kind = verdict.notes.some(([note]) => note === "wide") ? "wide" : verdict.notes.length ? "warn" : "";
     text += `<rect class="found ${kind}" x="${at(verdict.low).toFixed(3)}%" y="8" width="${Math.max(0.4, at(verdict.high) - at(verdict.low)).toFixed(3)}%" height="10" rx="2"/>`;
@@ -802,7 +855,7 @@ function rangeBar(each, verdict) {
 }
 
 function fillRanges(section) {
-  const which = choice("show", [["known", "ranges that were found"], ["warn", "at or near a limit"], ["wide", "types far too wide"], ["constant", "constants"], ["all", "all"]]);
+  const which = choice("show", [["all", "all"], ["known", "ranges that were found"], ["warn", "at or near a limit"], ["wide", "types far too wide"], ["constant", "constants"]]);
   const search = make("input", { type: "search", placeholder: "filter by name or type", "aria-label": "filter by name or type" });
   const count = make("span", { class: "soft" }), plot = make("div", { id: "plot" });
   const list = data("variables").map((each, index) => ({ each, index, verdict: judge(each) })).filter(({ each }) => !each.isHidden);
@@ -811,11 +864,11 @@ function fillRanges(section) {
   function show() {
     const words = search.value.toLowerCase().split(/\s+/).filter(Boolean);
     const shown = list.filter((item) => accepts(item) && words.every((word) => (variableName(item.each) + " " + item.each.type).toLowerCase().includes(word)));
-    plot.replaceChildren(...shown.slice(0, 400).flatMap(({ each, index, verdict }) => {
+    fill(plot, ...shown.slice(0, 400).flatMap(({ each, index, verdict }) => {
       const bar = make("div", {});
       bar.innerHTML = rangeBar(each, verdict);
       return [make("div", {}, variableLink(index), make("div", { class: "soft", style: "font-size:12px" }, each.type + (each.unit ? ", " + each.unit : ""))), bar,
-        make("div", {}, code(rangeText(each.found)), each.unit && verdict.low !== undefined ? make("span", { class: "soft" }, " " + each.unit) : "",
+        make("div", { title: each.notTracked || null }, each.found[0] === "unknown" ? make("span", { class: "soft" }, "not tracked") : code(rangeText(each.found)), each.unit && verdict.low !== undefined ? make("span", { class: "soft" }, " " + each.unit) : "",
           make("div", {}, verdict.notes.map(([kind, text]) => [chip(kind === "wide" ? "info" : "warn", text), " "])))];
     }));
     count.textContent = `${shown.length} of ${list.length} variables` + (shown.length > 400 ? ", the first 400 shown" : "");
@@ -823,7 +876,7 @@ function fillRanges(section) {
   search.addEventListener("input", debounce(show));
   which.addEventListener("change", show);
   section.append(make("div", { class: "tools" }, search, which, count),
-    make("p", { class: "soft" }, "Grey: what the type admits, in physical units. Coloured: what the optimiser found, over all places. A dashed frame: the type has no end."), plot);
+    make("p", { class: "soft" }, "Grey: what the type admits, in physical units. Coloured: what the optimiser found, over all places; pale: anything that the type can hold. A dashed frame: the type has no end."), plot);
   show();
 }
 
@@ -848,7 +901,7 @@ function fillWhy(section) {
     select.select.value = index;
     const each = data("variables")[index];
     const versions = each.versions.slice(0, 100);
-    answer.replaceChildren(make("h2", {}, variableName(each), " ", make("span", { class: "soft", style: "font-weight:400" }, `${each.kind} ${each.type}`), " ", lineLink(each.place)),
+    fill(answer, make("h2", {}, variableName(each), " ", make("span", { class: "soft", style: "font-weight:400" }, `${each.kind} ${each.type}`), " ", lineLink(each.place)),
       make("p", {}, "Altogether: ", code(rangeText(each.found)), each.unit ? " " + each.unit : "", each.notTracked ? `. Never taken for constant: ${each.notTracked}` : "",
         each.keptBecause ? `. Its definitions stay: ${each.keptBecause}` : ""),
       ...versions.flatMap((number) => {
@@ -876,11 +929,11 @@ function fillSaturation(section) {
     label: "saturations", hint: "filter by statement or variable", rows: data("saturations"), tools: [answers],
     accepts: (each) => { const wanted = answers.select.value; return !wanted || (wanted === "never" ? each.low === wanted && each.high === wanted : each.low === wanted || each.high === wanted); },
     columns: [
-      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place) },
+      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place, true) },
       { title: "variable", value: (each) => variableName(data("variables")[each.variable]), cell: (each) => variableLink(each.variable) },
       { title: "statement", value: (each) => data("statements")[each.statement]?.text ?? "", code: true },
       { title: "limits", value: (each) => limitsText(data("variables")[each.variable]).replace(/ saturates$/, "") },
-      { title: "brings", value: (each) => rangeText(each.value) },
+      { title: "brings", value: (each) => rangeText(each.value), cell: (each) => make("span", { class: "whole" }, rangeText(each.value)) },
       { title: "at the lower limit", value: (each) => each.low, cell: (each) => cell(each.low) },
       { title: "at the upper limit", value: (each) => each.high, cell: (each) => cell(each.high) }
     ] }));
@@ -892,12 +945,12 @@ function fillStatements(section) {
     label: "statements", hint: "filter by text, pass or reason", rows: data("fates"), tools: [which],
     accepts: (each) => ({ removed: each.isRemoved, kept: !each.isRemoved, unused: each.looksUnused })[which.select.value] ?? true,
     columns: [
-      { title: "line", value: (each) => lineOf(data("statements")[each.statement].place), cell: (each) => lineLink(data("statements")[each.statement].place) },
+      { title: "line", value: (each) => lineOf(data("statements")[each.statement].place), cell: (each) => lineLink(data("statements")[each.statement].place, true) },
       { title: "statement", value: (each) => data("statements")[each.statement].text, code: true },
       { title: "fate", value: (each) => each.isRemoved ? "removed" : each.looksUnused ? "stays, looks unused" : "stays",
         cell: (each) => each.isRemoved ? chip("removed") : chip(each.looksUnused ? "warn" : "good", each.looksUnused ? "stays, looks unused" : "stays") },
       { title: "pass", value: (each) => each.isRemoved ? data("snapshots")[each.snapshot].pass : "", cell: (each) => each.isRemoved ? passLink(each.snapshot) : "" },
-      { title: "why", value: (each) => each.why },
+      { title: "why", value: (each) => each.why, cell: (each) => prose(each.why) },
       { title: "see", value: (each) => lineOf(each.because), cell: (each) => lineLink(each.because) }
     ] }));
 }
@@ -907,9 +960,9 @@ function fillRemarks(section) {
   section.append(sortedTable({
     label: "remarks", hint: "filter the remarks", rows: data("remarks"), tools: [kind], accepts: (each) => !kind.select.value || each.kind === kind.select.value,
     columns: [
-      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place) },
+      { title: "line", value: (each) => lineOf(each.place), cell: (each) => lineLink(each.place, true) },
       { title: "kind", value: (each) => each.kind, cell: (each) => chip(each.kind, { passed: "done", missed: "not done", analysis: "found out" }[each.kind]) },
-      { title: "remark", value: (each) => each.text },
+      { title: "remark", value: (each) => each.text, cell: (each) => prose(each.text) },
       { title: "pass", value: (each) => each.pass }
     ] }));
 }
@@ -1010,22 +1063,25 @@ function fillCode(section) {
 const views = [["passes", "Passes", null], ["variables", "Variables", fillVariables], ["ranges", "Ranges", fillRanges], ["why", "Why", fillWhy],
   ["saturation", "Saturation", fillSaturation], ["statements", "Statements", fillStatements], ["remarks", "Remarks", fillRemarks], ["code", "C code", fillCode]];
 const filled = new Set(["passes"]);
+let shown = "passes";
 
 function openView(name) {
-  for (const [each, , fill] of views) {
+  for (const [each, , fillView] of views) {
     const section = byId("view-" + each), isOpen = each === name;
     section.hidden = !isOpen;
     const tab = byId("tab-" + each);
     tab.setAttribute("aria-selected", isOpen);
     tab.tabIndex = isOpen ? 0 : -1;
+    if (isOpen && shown !== name) byId("views").scrollTop = 0;
     if (!isOpen || filled.has(each)) continue;
     filled.add(each);
-    fill(section);
+    fillView(section);
   }
+  shown = name;
 }
 
 function showTabs() {
-  byId("tabs").append(...views.map(([name, title]) => make("button", { type: "button", role: "tab", id: "tab-" + name, "aria-controls": "view-" + name, onclick: () => openView(name) }, title)));
+  byId("tabs").append(...views.map(([name, title]) => make("button", { type: "button", role: "tab", id: "tab-" + name, "aria-controls": "view-" + name, onclick: () => document.documentElement.dataset.ready && openView(name) }, title)));
   for (const [name] of views) byId("view-" + name).setAttribute("aria-labelledby", "tab-" + name);
   byId("tabs").addEventListener("keydown", (event) => {
     const step = { ArrowRight: 1, ArrowLeft: -1 }[event.key];
@@ -1075,7 +1131,6 @@ function listen() {
 
 function start() {
   showTabs();
-  listen();
   const assumptions = data("about").assumptions;
   if (assumptions.length) {
     byId("assumptions").hidden = false;
@@ -1087,14 +1142,21 @@ function start() {
     byId("timeline").before(make("p", { class: "notice", id: "no-graphviz" }, "Graphviz (the program dot) was not found when this page was written, so it has no pictures of the graphs. Everything else is here."));
   else if (data("pictures").leftOut)
     byId("timeline").before(make("p", { class: "notice", id: "left-out" }, `${data("pictures").leftOut} of ${data("pictures").procedures.length} pictures are left out, those with the fewest changes: the time for them was over.`));
-  showSource();
   const snapshots = data("snapshots");
   const propagation = snapshots.findIndex((each) => each.pass.startsWith("propagate"));
   choosePass(propagation >= 0 ? propagation : snapshots.length - 1);
   byId("inspector").append(make("p", { class: "empty" }, "Choose a line or a node: what it became, which pass did it, and why, stands here."));
-  document.documentElement.dataset.ready = String(Math.round(performance.now()));
+  requestAnimationFrame(() => setTimeout(() => { document.documentElement.dataset.firstPicture = String(Math.round(performance.now())); }));
+}
+
+// The rest of the data stands behind the script: only when it is there can everything be clicked.
+function startRest() {
+  showSource();
+  listen();
+  document.documentElement.dataset.ready = "yes";
   setTimeout(markSource, 50);
 }
 
 start();
+document.addEventListener("DOMContentLoaded", startRest);
 })();
