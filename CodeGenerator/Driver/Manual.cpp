@@ -128,7 +128,7 @@ void replace(std::string& Text, const std::string& Mark, const std::string& By) 
 } // namespace
 
 std::string printManualPage(const CLI::App& App) {
-    const std::string Name = App.get_name();
+    const std::string& Name = App.get_name();
     std::vector<std::string> Description = splitParagraphs(App.get_description()).front();
     const std::string Summary = Description.front().substr(Description.front().find(" - ") + 3);
     Description.front() = Name + ": " + Summary;

@@ -27,7 +27,8 @@
 #endif
 #endif
 #ifdef ENDURANCE_ASAN
-#include <sanitizer/allocator_interface.h>
+// gcc ships the runtime without this header of it.
+extern "C" std::size_t __sanitizer_get_current_allocated_bytes();
 #endif
 
 namespace endurance {
