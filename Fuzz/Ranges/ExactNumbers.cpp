@@ -58,7 +58,7 @@ Exact sum(const Exact& a, const Exact& b) {
         return a.Mantissa == 0 ? b : a;
     if (a.Exponent < b.Exponent)
         return sum(b, a);
-    return makeExact((a.Mantissa << (a.Exponent - b.Exponent)) + b.Mantissa, b.Exponent);
+    return makeExact(a.Mantissa * (One << (a.Exponent - b.Exponent)) + b.Mantissa, b.Exponent);
 }
 
 Exact negative(const Exact& a) {
@@ -93,7 +93,7 @@ int compare(double a, double b) {
 /// Toward zero, or to the nearest with halves away from zero.
 Wide wholeOf(const Exact& Number, bool ToNearest) {
     if (Number.Exponent >= 0)
-        return Number.Mantissa << Number.Exponent;
+        return Number.Mantissa * (One << Number.Exponent);
     const Wide Unit = One << -Number.Exponent;
     const Wide Magnitude = Number.Mantissa < 0 ? -Number.Mantissa : Number.Mantissa;
     const Wide Whole = (Magnitude + (ToNearest ? Unit / 2 : 0)) / Unit;
