@@ -4,6 +4,7 @@
 #include "Shrinker.h"
 
 #include "Generators/RandomProgram.h"
+#include "Oracles/HostShell.h"
 
 #include <chrono>
 #include <csignal>
@@ -110,8 +111,8 @@ double coreSeconds(pid_t Process) {
 class Fuzzer {
 public:
     explicit Fuzzer(const FuzzOptions& Options) : m_Options(Options), m_Start(Clock::now()) {
-        m_Scratch = (std::filesystem::temp_directory_path() / "hpnfuzz-XXXXXX").string();
-        if (::mkdtemp(m_Scratch.data()) == nullptr)
+        m_Scratch = hostshell::makeDirectory("hpnfuzz");
+        if (m_Scratch.empty())
             std::perror("hpnfuzz: scratch directory");
     }
     ~Fuzzer() {

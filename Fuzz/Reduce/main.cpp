@@ -1,3 +1,4 @@
+#include "Oracles/HostShell.h"
 #include "Shrinker.h"
 
 #include "Language/Diagnostics.h"
@@ -50,8 +51,7 @@ class Check {
 public:
     Check(const std::string& Driver, const std::string& Command,
           const std::vector<std::string>& Options) {
-        char Template[] = "/tmp/hpnreduce-XXXXXX";
-        m_Directory = mkdtemp(Template);
+        m_Directory = hostshell::makeDirectory("hpnreduce");
         const std::string Source = quote(m_Directory + "/program.hpn");
         const std::string Code = quote(m_Directory + "/program.c");
         const std::string Quiet = " >/dev/null 2>&1";
