@@ -13,6 +13,7 @@
 #include "Language/Reader.h"
 #include "Model/PendingWarnings.h"
 #include "Road/PassSequence.h"
+#include "ZfCPooledMemController.h"
 
 #include <malloc.h>
 #include <sys/resource.h>
@@ -110,6 +111,9 @@ int main(int ArgumentCount, char** pArguments) {
         std::fprintf(stderr, "usage: RoadTimer PROGRAM.hpn [RUNS]\n");
         return 2;
     }
+    // As in the driver.
+    static ZfCPooledMemController s_Memory;
+    pZFMemory = &s_Memory;
     const char* Separator = "[";
     for (int Run = 0; Run < Runs; ++Run) {
         Figures Taken;

@@ -77,7 +77,8 @@ const std::string& ProgramGraph::readableNameOf(const std::string& ProcedureName
 }
 
 void ProgramGraph::appendCalls() {
-    for (leda::node v : m_pGraph->all_nodes()) {
+    for (leda::node v = m_pGraph->first_node(); v != m_pGraph->stop_node();
+         v = m_pGraph->next_node(v)) {
         ZfCBasicBlock* pBlock = (*m_pGraph)[v]->isBasicBlock();
         if (pBlock == nullptr)
             continue;

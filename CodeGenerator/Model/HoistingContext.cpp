@@ -23,7 +23,7 @@ namespace hpn {
 HoistingContext* HoistingContext::s_pActive = nullptr;
 
 HoistingContext::HoistingContext(ZfCControlFlowGraph& Graph) : m_Graph(Graph) {
-    for (leda::node v : Graph.all_nodes()) {
+    for (leda::node v = Graph.first_node(); v != Graph.stop_node(); v = Graph.next_node(v)) {
         ZfCBasicBlock* pBlock = Graph[v]->isBasicBlock();
         if (pBlock == nullptr)
             continue;

@@ -65,7 +65,7 @@ namespace {
 
 ValueRange rangeOfDeclaredType(ZfCCfgVariable* pVariable) {
     ZfCCfgSFVariable* pOriginal = originalOf(pVariable);
-    ValueRange Range = storageRange(pOriginal->getType());
+    ValueRange Range = pOriginal->getStorageRange();
     // Stores leave no negative zero; only code outside the optimiser's sight can have written one.
     if (!pOriginal->isVolatile())
         Range.MayBeNegativeZero = false;

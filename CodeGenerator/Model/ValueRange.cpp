@@ -248,8 +248,32 @@ ValueRange combinePieces(Operator Op, const ValueRange& Left, const ValueRange& 
     return Shaped;
 }
 
+bool isFinite(const ValueRange& Range) {
+    return -Infinity < Range.Low && Range.Low <= Range.High && Range.High < Infinity;
+}
+
+/// The hull by the outer corners alone, which is that of all pieces, where no sum can be a negative
+/// zero: only -0 + -0 and -0 - 0 are.
+bool combineEnds(Operator Op, const ValueRange& Left, const ValueRange& Right, ValueRange& Result) {
+    if (!isFinite(Left) || !isFinite(Right))
+        return false;
+    const bool IsIntegral = Left.IsIntegral && Right.IsIntegral;
+    if (Op == Operator::Add) {
+        if (Left.MayBeNegativeZero && Right.MayBeNegativeZero)
+            return false;
+        Result = makeInterval(Left.Low + Right.Low, Left.High + Right.High, IsIntegral);
+        return true;
+    }
+    if (Left.MayBeNegativeZero)
+        return false;
+    Result = makeInterval(Left.Low - Right.High, Left.High - Right.Low, IsIntegral);
+    return true;
+}
+
 ValueRange rangeOfSum(Operator Op, const ValueRange& Left, const ValueRange& Right) {
-    ValueRange Result = combinePieces(Op, Left, Right);
+    ValueRange Result;
+    if (!combineEnds(Op, Left, Right, Result))
+        Result = combinePieces(Op, Left, Right);
     setStepOfSum(Result, Left, Right);
     Result.MayBeNaN = Result.MayBeNaN || Left.MayBeNaN || Right.MayBeNaN;
     return Result;
@@ -257,6 +281,16 @@ ValueRange rangeOfSum(Operator Op, const ValueRange& Left, const ValueRange& Rig
 
 /// A zero factor gives 0.0 even against a NaN; only what is not zero lets the NaN through.
 ValueRange rangeOfProduct(const ValueRange& Left, const ValueRange& Right) {
+    // Whole factors give no negative zero, neither by their signs nor by underflow.
+    if (Left.IsIntegral && Right.IsIntegral && !Left.MayBeNaN && !Right.MayBeNaN &&
+        isFinite(Left) && isFinite(Right)) {
+        const auto [Low, High] =
+            std::minmax({computeBinary(Operator::Multiply, Left.Low, Right.Low),
+                         computeBinary(Operator::Multiply, Left.Low, Right.High),
+                         computeBinary(Operator::Multiply, Left.High, Right.Low),
+                         computeBinary(Operator::Multiply, Left.High, Right.High)});
+        return makeInterval(Low, High, true);
+    }
     ValueRange Result = combinePieces(Operator::Multiply, Left, Right);
     if ((Left.MayBeNaN && holdsZero(Right)) || (Right.MayBeNaN && holdsZero(Left)))
         Result = hull(Result, makeInterval(0.0, 0.0, true));

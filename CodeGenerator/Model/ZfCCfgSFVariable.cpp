@@ -5,7 +5,7 @@
 
 ZfCCfgSFVariable::ZfCCfgSFVariable(const hpn::Variable& Declaration)
     : m_Declaration(Declaration), m_DataType(Declaration.pType->Base),
-      m_Scaling(*Declaration.pType),
+      m_Scaling(*Declaration.pType), m_StorageRange(hpn::storageRange(*Declaration.pType)),
       m_IsUpperBorderSaturated(hpn::isUpperClipStable(*Declaration.pType)),
       m_IsLowerBorderSaturated(hpn::isLowerClipStable(*Declaration.pType)) {
     if (Declaration.Count > 0)

@@ -2,6 +2,7 @@
 #define ZFCCFGSFVARIABLE_H
 
 #include "Language/Program.h"
+#include "Model/ValueRange.h"
 #include "ZF_DataType.h"
 #include "ZF_Scaling.h"
 #include "ZfCCfgVariable.h"
@@ -63,6 +64,8 @@ public:
 
     const hpn::Variable& getDeclaration() const { return m_Declaration; }
     const hpn::Type& getType() const { return *m_Declaration.pType; }
+    /// What storage of its type can hold; kept, since each read of the variable asks for it.
+    const hpn::ValueRange& getStorageRange() const { return m_StorageRange; }
     /// Reading it is itself a side effect: an input, which the outside changes at any time.
     bool isReadASideEffect() const { return m_Declaration.Kind == hpn::VariableKind::Input; }
     /// Some statement of the program assigns it, as a left-hand side, a formal of a call or a
@@ -87,6 +90,7 @@ private:
     const hpn::Variable& m_Declaration;
     hpn::TargetDataType m_DataType;
     hpn::TargetScaling m_Scaling;
+    hpn::ValueRange m_StorageRange;
     bool m_IsUpperBorderSaturated;
     bool m_IsLowerBorderSaturated;
     bool m_IsAssigned = false;

@@ -6,11 +6,15 @@
 #include "ZfCMemController.h"
 #include "ZfCMessageSink.h"
 #include "ZfCPlatformMessageServer.h"
+#include "ZfCPooledMemController.h"
 #include "ZfCScaleTool.h"
 
+#include <algorithm>
 #include <cmath>
+#include <cstdint>
 #include <gtest/gtest.h>
 #include <limits>
+#include <random>
 #include <sstream>
 #include <string>
 #include <vector>
@@ -177,5 +181,49 @@ TEST(MessageServer, InternalInformationIsASwitchAndAssertionsAreObserved) {
 TEST(MemoryController, IsNotSetByThePlatform) {
     EXPECT_EQ(pZFMemory, nullptr);
 }
+
+// Blocks of all sizes come and go in random order, each filled with a byte of its own: no two
+// overlap, each is aligned, and what is given back serves again.
+TEST(MemoryController, PooledBlocksKeepTheirBytes) {
+    struct Block {
+        unsigned char* pBytes;
+        unsigned int Size;
+        unsigned char Mark;
+    };
+    ZfCPooledMemController Controller;
+    std::mt19937 Random(1);
+    std::vector<Block> Live;
+    auto giveBack = [&](std::size_t At) {
+        const Block Gone = Live[At];
+        Live[At] = Live.back();
+        Live.pop_back();
+        EXPECT_EQ(std::count(Gone.pBytes, Gone.pBytes + Gone.Size, Gone.Mark), Gone.Size);
+        Controller.freeMemBlock(Gone.pBytes);
+    };
+    for (int i = 0; i < 40000; ++i) {
+        if (!Live.empty() && Random() % 3 == 0)
+            giveBack(Random() % Live.size());
+        const unsigned int Size = Random() % 100 == 0 ? Random() % 200000 : Random() % 1200;
+        auto* const pBytes = static_cast<unsigned char*>(Controller.allocMemBlock(Size));
+        ASSERT_EQ(reinterpret_cast<std::uintptr_t>(pBytes) % 16, 0u);
+        Live.push_back({pBytes, Size, static_cast<unsigned char>(i)});
+        std::fill_n(pBytes, Size, Live.back().Mark);
+    }
+    while (!Live.empty())
+        giveBack(Live.size() - 1);
+    Controller.freeMemBlock(nullptr);
+}
+
+#if !defined(LEDA_POOLS_OFF)
+TEST(MemoryController, PooledBlocksServeAgain) {
+    ZfCPooledMemController Controller;
+    void* const pFirst = Controller.allocMemBlock(40);
+    void* const pSecond = Controller.allocMemBlock(48);
+    EXPECT_EQ(static_cast<char*>(pSecond) - static_cast<char*>(pFirst), 48);
+    Controller.freeMemBlock(pFirst);
+    EXPECT_NE(Controller.allocMemBlock(64), pFirst);
+    EXPECT_EQ(Controller.allocMemBlock(33), pFirst);
+}
+#endif
 
 } // namespace

@@ -96,7 +96,8 @@ TEST(ModuleAllocation, EveryBlockComesBackAndNoneOfTheHosts) {
 #ifdef MODULE_HAS_OWN_ALLOCATION
     EXPECT_GT(Controller.getTaken(), 8);
 #else
-    EXPECT_EQ(Controller.getTaken(), 0);
+    // The blocks of the library's own classes; containers and strings are the host's.
+    EXPECT_GT(Controller.getTaken(), 4);
 #endif
     EXPECT_EQ(Controller.getLive(), 0);
     EXPECT_EQ(Controller.getForeign(), 0);

@@ -74,13 +74,13 @@ private:
     edge m_next_out = nullptr;
     node m_end[2] = {};
     edge m_next_in = nullptr;
+    int m_index = 0;
+    unsigned int m_graph = 0;               // serial number of the graph
     alignas(8) unsigned char m_record[8]{}; // GRAPH's edge information
     edge m_next = nullptr;                  // in the edge list
     edge m_prev = nullptr;
     edge m_prev_out = nullptr;
     edge m_prev_in = nullptr;
-    int m_index = 0;
-    unsigned int m_graph = 0; // serial number of the graph
 };
 
 namespace order_detail {

@@ -8,8 +8,8 @@ unsigned int ZfCCfgVariable::s_GlobIndexCnt = 0;
 
 ZfCCfgVariable::ZfCCfgVariable()
     : m_Index(s_GlobIndexCnt++), m_DebugIndex(static_cast<int>(m_Index)),
-      m_Value(eCfgValueUndetermined), m_IsArray(false), m_IsErasable(false), m_IsVolatile(false),
-      m_pNonVirtualAlias(this) {
+      m_pNonVirtualAlias(this), m_IsArray(false), m_IsErasable(false), m_IsVolatile(false),
+      m_Value(eCfgValueUndetermined) {
 }
 
 ZfCCfgVariable::~ZfCCfgVariable() = default;

@@ -151,13 +151,14 @@ private:
     unsigned int m_Index;
     int m_DebugIndex;                               // written by the constructor alone
     leda::stack<ZfCCfgVariable*> m_SSAReplacements; // balanced by renaming; else empty
-    ZfCCfgValue m_Value;
+    leda::set<ZfCCfgVariable*, leda::avl_tree> m_VirtualAliases;
     leda::set<leda::node, leda::avl_tree> m_Uses; // stale after any graph edit
+    ZfCCfgVariable* m_pNonVirtualAlias;           // this, unless a virtual alias
+    // The value stands last, beside the range of a version: the propagation reads them together.
     bool m_IsArray;
     bool m_IsErasable;
     bool m_IsVolatile;
-    ZfCCfgVariable* m_pNonVirtualAlias; // this, unless a virtual alias
-    leda::set<ZfCCfgVariable*, leda::avl_tree> m_VirtualAliases;
+    ZfCCfgValue m_Value;
 
     static unsigned int s_GlobIndexCnt;
 };

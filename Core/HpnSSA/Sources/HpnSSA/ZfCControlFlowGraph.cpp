@@ -3,7 +3,7 @@
 #include "ZfCCfgVisitor.h"
 #include "ZfCCfgVisitorSSA.h"
 
-ZfCControlFlowGraph::ZfCControlFlowGraph() : m_StartNode(nullptr), m_Visited(false) {
+ZfCControlFlowGraph::ZfCControlFlowGraph() : m_StartNode(nullptr) {
 }
 
 ZfCControlFlowGraph::ZfCControlFlowGraph(ZfCControlFlowGraph const& Other) = default;

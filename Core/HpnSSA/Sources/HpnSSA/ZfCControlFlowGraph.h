@@ -235,10 +235,6 @@ private:
                       leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
     void visitIfDirty(leda::node Node, leda::list<leda::edge>& CfgEdgeList,
                       leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
-    int countExecutableInEdges(leda::node Node);
-    void setVisited(leda::node Node);
-    bool isVisited(leda::node Node);
-    void clearAllVisited();
 
     void visitPhiFunction(ZfCPhiFunction* pPhi, leda::node Node, bool& FoundNewConstant);
     void visitInstruction(ZfCBasicBlock* pBlock, leda::node Node,
@@ -270,8 +266,8 @@ private:
 
     leda::node m_StartNode; // entry of "#main"; null until set
     leda::dictionary<WqCXString, ZfCCfgProcedure*, leda::ab_tree> m_Procedures; // by name
-    leda::map<leda::node, bool> m_Visited;         // blocks that the last iteration has reached
-    ZfCPropagationState* m_pPropagation = nullptr; // while constants are propagated
+    // What the propagation knows of nodes and edges, visited marks included; null at other times.
+    ZfCPropagationState* m_pPropagation = nullptr;
 };
 
 #endif

@@ -7,7 +7,7 @@
 #include "ZfCControlFlowGraph.h"
 
 void ZfCControlFlowGraph::replaceConstantConditions() {
-    for (leda::node v : all_nodes()) {
+    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
         ZfCBasicBlock* pBlock = inf(v)->isBasicBlock();
         if (pBlock != nullptr && pBlock->getBranchCond() != nullptr) {
             pBlock->getBranchCond()->replaceConstantCondition();
@@ -16,7 +16,7 @@ void ZfCControlFlowGraph::replaceConstantConditions() {
 }
 
 void ZfCControlFlowGraph::replaceConstantVariables() {
-    for (leda::node v : all_nodes()) {
+    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
         ZfCBasicBlock* pBlock = inf(v)->isBasicBlock();
         if (pBlock == nullptr) {
             continue;

@@ -205,12 +205,7 @@ bool ZfCControlFlowGraph::eliminateDeadCode() {
     bool HasLostOperand = false;
     bool HasLostCall = false;
     leda::list<leda::edge> EdgesToDelete;
-    leda::node pNext = nullptr;
-    for (leda::node v = first_node(); v != stop_node(); v = pNext) {
-        pNext = next_node(v);
-        if (State.isVisited(v) || !State.isBasicBlock(v)) {
-            continue;
-        }
+    for (leda::node v : State.takeUnvisitedBlocks()) {
         ZfCBasicBlock* pBlock = inf(v)->isBasicBlock();
         // Step 1.
         EdgesToDelete.clear();

@@ -170,9 +170,12 @@ leda::node ZfCControlFlowGraph::findBranchNode(leda::node v, ZfCCfgExpression* p
 }
 
 void ZfCControlFlowGraph::divideBasicBlock() {
-    leda::list<leda::node> WorkList = all_nodes(); // a copy: the nodes made here are not visited
+    // The nodes made here come behind the last one and are not visited.
+    int Left = number_of_nodes();
     leda::list<leda::node> NodeList;
-    for (leda::node x : WorkList) {
+    leda::node pNext = nullptr;
+    for (leda::node x = first_node(); Left > 0; x = pNext, --Left) {
+        pNext = next_node(x);
         ZfCBasicBlock* pBlock = inf(x)->isBasicBlock();
         if (pBlock == nullptr) {
             continue;

@@ -86,28 +86,6 @@ void ZfCControlFlowGraph::initSparseConditionalConstant(leda::node StartNode,
     }
 }
 
-int ZfCControlFlowGraph::countExecutableInEdges(leda::node Node) {
-    int Count = 0;
-    for (leda::edge e = first_in_edge(Node); e != nullptr; e = in_succ(e)) {
-        if (m_pPropagation->isExecutable(e)) {
-            ++Count;
-        }
-    }
-    return Count;
-}
-
-void ZfCControlFlowGraph::setVisited(leda::node Node) {
-    m_Visited[Node] = true;
-}
-
-bool ZfCControlFlowGraph::isVisited(leda::node Node) {
-    return m_pPropagation->isVisited(Node);
-}
-
-void ZfCControlFlowGraph::clearAllVisited() {
-    m_Visited.clear_entries();
-}
-
 // Step 3c: a phi function is visited over each edge, anything else on first arrival.
 void ZfCControlFlowGraph::serveCfgEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
                                        leda::list<leda::edge>& SSAEdgeList,
@@ -155,7 +133,7 @@ void ZfCControlFlowGraph::visitIfDirty(leda::node Node, leda::list<leda::edge>& 
     if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
         visitPhiFunction(pPhi, Node, FoundNewConstant);
     } else {
-        ZF_ASSERT(countExecutableInEdges(Node) >= 1);
+        ZF_ASSERT(State.isVisited(Node)); // so one of its in-edges is executable
         visitInstruction(pBlock, Node, CfgEdgeList, SSAEdgeList, FoundNewConstant);
     }
 }
@@ -194,13 +172,7 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode,
         }
         // Step 5.
     } while (FoundNewConstant || HasLostOperand);
-    // The marks and flags of the last iteration stay.
-    clearAllVisited();
-    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
-        if (State.isVisited(v)) {
-            setVisited(v);
-        }
-    }
+    // The flags of the last iteration stay.
     State.finish();
     m_pPropagation = nullptr;
 }

@@ -109,8 +109,8 @@ void ZfCControlFlowGraph::createValidConditionAssignments(ZfCCfgExpression*& pCo
 }
 
 void ZfCControlFlowGraph::insertValidConditionAssignments() {
-    leda::list<leda::node> NodeList = all_nodes(); // a copy: the new blocks have no condition
-    for (leda::node v : NodeList) {
+    // The new blocks come behind the last node and have no condition.
+    for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
         ZfCBasicBlock* pBlock = inf(v)->isBasicBlock();
         ZfCCfgExpression* pCond = pBlock != nullptr ? pBlock->getBranchCond() : nullptr;
         if (pCond == nullptr) {

@@ -1,31 +1,20 @@
 #include "ZfCModuleAllocation.h"
 
-#ifdef HPNSSA_MODULE_ALLOCATION
-#include <cstdlib>
-
 #include "ZfCMemController.h"
-#endif
+
+#include <cstdlib>
 
 // The module's new and delete.
 //
 // The replaced operators stand in this file alone and only where HPNSSA_MODULE_ALLOCATION says so:
 // the shared library always has them and binds them locally, so that the host program's own new and
 // delete are not touched; a static build has them by choice, since there they serve the whole
-// program.
+// program. The blocks of the library's own classes go through the controller in either build; where
+// there is none, a static build without operators of its own leaves them to the host's.
 //
 // The forms for over-aligned types are left to the language's library, which serves them as a pair
 // of its own: a block of the controller promises no more than the default alignment, and the
 // library has no over-aligned type.
-
-void* ZfAllocModuleBlock(std::size_t Size) noexcept {
-    return ::operator new(Size, std::nothrow);
-}
-
-void ZfFreeModuleBlock(void* pBlock) noexcept {
-    ::operator delete(pBlock);
-}
-
-#ifdef HPNSSA_MODULE_ALLOCATION
 
 namespace {
 
@@ -50,13 +39,6 @@ void* allocate(std::size_t Size) {
     }
 }
 
-void* allocateOrThrow(std::size_t Size) {
-    void* const pBlock = allocate(Size);
-    if (pBlock == nullptr)
-        throw std::bad_alloc();
-    return pBlock;
-}
-
 void* allocateOrNull(std::size_t Size) noexcept {
     try {
         return allocate(Size);
@@ -72,6 +54,37 @@ void release(void* pBlock) noexcept {
         pZFMemory->freeMemBlock(pBlock);
     else
         std::free(pBlock);
+}
+
+} // namespace
+
+void* ZfAllocModuleBlock(std::size_t Size) noexcept {
+#ifndef HPNSSA_MODULE_ALLOCATION
+    if (pZFMemory == nullptr)
+        return ::operator new(Size, std::nothrow);
+#endif
+    return allocateOrNull(Size);
+}
+
+void ZfFreeModuleBlock(void* pBlock) noexcept {
+#ifndef HPNSSA_MODULE_ALLOCATION
+    if (pZFMemory == nullptr) {
+        ::operator delete(pBlock);
+        return;
+    }
+#endif
+    release(pBlock);
+}
+
+#ifdef HPNSSA_MODULE_ALLOCATION
+
+namespace {
+
+void* allocateOrThrow(std::size_t Size) {
+    void* const pBlock = allocate(Size);
+    if (pBlock == nullptr)
+        throw std::bad_alloc();
+    return pBlock;
 }
 
 } // namespace

@@ -4,11 +4,12 @@
 
 ZfCPropagationState::ZfCPropagationState(Graph& Of, bool SSAEdgesAreComplete)
     : m_Graph(Of), m_SkipsCleanNodes(SSAEdgesAreComplete), m_Nodes(Of.max_node_index() + 1),
-      m_Edges(Of.max_edge_index() + 1) {
+      m_Blocks(Of.number_of_nodes()), m_Edges(Of.max_edge_index() + 1) {
     for (leda::node v = Of.first_node(); v != Of.stop_node(); v = Of.next_node(v)) {
         if (Of.inf(v)->isBasicBlock() != nullptr) {
-            m_Nodes[m_Graph.index(v)].IsBlock = true;
-            ++m_Blocks;
+            const int Index = m_Graph.index(v);
+            m_Nodes[Index].IsBlock = true;
+            m_Blocks[m_NumberOfBlocks++] = {v, Index};
         }
     }
     for (leda::edge e = Of.first_edge(); e != Of.stop_edge(); e = Of.next_edge(e)) {
@@ -24,6 +25,20 @@ void ZfCPropagationState::beginIteration() {
         m_Edges[i] &= IsSSA;
     }
     m_VisitedBlocks = 0;
+}
+
+leda::list<leda::node> ZfCPropagationState::takeUnvisitedBlocks() {
+    leda::list<leda::node> Unvisited;
+    int Kept = 0;
+    for (int i = 0; i < m_NumberOfBlocks; ++i) {
+        if (m_Nodes[m_Blocks[i].Index].IsVisited) {
+            m_Blocks[Kept++] = m_Blocks[i];
+        } else {
+            Unvisited.append(m_Blocks[i].Node);
+        }
+    }
+    m_NumberOfBlocks = Kept;
+    return Unvisited;
 }
 
 bool ZfCPropagationState::arriveAt(leda::node v) {
@@ -103,7 +118,6 @@ bool ZfCPropagationState::hasSSAInEdge(leda::node v) const {
 }
 
 void ZfCPropagationState::forget(leda::node v) {
-    --m_Blocks;
     for (leda::edge e = m_Graph.first_in_edge(v); e != nullptr; e = m_Graph.in_succ(e)) {
         if (!isSSAEdge(e)) {
             Node& Before = m_Nodes[m_Graph.index(m_Graph.source(e))];

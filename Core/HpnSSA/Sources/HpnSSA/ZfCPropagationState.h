@@ -32,7 +32,10 @@ public:
     // Nothing is reached, no edge is executable.
     void beginIteration();
     // Whether every basic block has been reached in this iteration.
-    bool allBlocksAreVisited() const { return m_VisitedBlocks == m_Blocks; }
+    bool allBlocksAreVisited() const { return m_VisitedBlocks == m_NumberOfBlocks; }
+    // The basic blocks that have not been reached, in the order of the graph's nodes. They are no
+    // longer counted: the caller removes them.
+    leda::list<leda::node> takeUnvisitedBlocks();
 
     // ---- nodes ----
 
@@ -89,6 +92,11 @@ private:
         unsigned char Taken = 0; // control flow out-edges by position, of the last visit
         leda::edge pOnlyOut = nullptr;
     };
+    // A basic block with its index, which so is known without a look at the node.
+    struct Block {
+        leda::node Node;
+        int Index;
+    };
     enum : unsigned char { IsSSA = 1, IsExecutable = 2 };
     static constexpr int s_MostRemembered = 8; // bits of Taken
 
@@ -102,9 +110,10 @@ private:
 
     Graph& m_Graph;
     bool m_SkipsCleanNodes;
-    int m_Blocks = 0;
+    int m_NumberOfBlocks = 0;
     int m_VisitedBlocks = 0;
     leda::array<Node> m_Nodes;          // by node index
+    leda::array<Block> m_Blocks;        // in the order of the graph's nodes
     leda::array<unsigned char> m_Edges; // by edge index
 };
 

@@ -2,6 +2,7 @@
 #define ZFCSSAVARIABLE_H
 
 #include "ZfCCfgVariable.h"
+#include "ZfCModuleAllocation.h"
 
 // One SSA version of a variable, made for one definition by renaming.
 //
@@ -12,6 +13,8 @@ class HPNSSA_EXPORT ZfCSSAVariable : public ZfCCfgVariable {
     friend class ZfCCfgFactory;
 
 public:
+    HPNSSA_MODULE_BLOCKS
+
     ZfCSSAVariable(const ZfCSSAVariable&) = default;
     ZfCSSAVariable& operator=(const ZfCSSAVariable&) = default;
 

@@ -1,0 +1,62 @@
+#ifndef ZFCPOOLEDMEMCONTROLLER_H
+#define ZFCPOOLEDMEMCONTROLLER_H
+
+#include "ZfCMemController.h"
+
+#include <cstddef>
+
+// A memory controller for a host that has none of its own: a graph is many small records, which
+// here lie side by side without a header, so that a run needs less memory and fewer cache lines
+// than with the standard heap.
+//
+// Blocks up to 1024 bytes lie in pages of one size each; a page is aligned, so that a block finds
+// its size by its address. Larger ones come from malloc one by one. Pages stay with the controller
+// for later blocks of their size and go with it. Allocation and release cost a few instructions.
+// One thread at a time, like the library. Under the address sanitizer every block is malloc's own.
+class HPNPLATFORM_EXPORT ZfCPooledMemController : public ZfCMemController {
+public:
+    ZfCPooledMemController() = default;
+    ZfCPooledMemController(const ZfCPooledMemController&) = delete;
+    ZfCPooledMemController& operator=(const ZfCPooledMemController&) = delete;
+    // Gives all pages back: no small block may be in use any more.
+    ~ZfCPooledMemController() override;
+
+    // A block aligned to 16 bytes, the caller's until freeMemBlock; null if there is no memory.
+    void* allocMemBlock(unsigned int Size) override;
+    // Takes back a block of this controller.
+    void freeMemBlock(void* pBlock) override;
+
+private:
+    static constexpr std::size_t s_Granule = 16;
+    static constexpr std::size_t s_GreatestSmall = 1024;
+    static constexpr std::size_t s_PageBytes = 64 * 1024;
+
+    // At the begin of each page and of each large block.
+    struct alignas(s_Granule) Header {
+        void* pMemory;     // of a large block: what malloc gave; else null
+        std::size_t Class; // of a page: the size of its blocks in granules
+    };
+    struct FreeBlock {
+        FreeBlock* pNext;
+    };
+    struct alignas(s_Granule) Chunk {
+        Chunk* pNext;
+    };
+
+    static Header* headerOf(void* pBlock);
+    static char* alignToPage(char* pMemory);
+    static void* allocateLarge(std::size_t Size);
+    void* allocateFromPage(std::size_t Class);
+    bool addChunk();
+
+    static constexpr std::size_t s_Classes = s_GreatestSmall / s_Granule + 1;
+    FreeBlock* m_pFree[s_Classes] = {}; // by class: blocks given back
+    char* m_pCursor[s_Classes] = {};    // by class: the unused rest of its newest page
+    char* m_pEnd[s_Classes] = {};
+    char* m_pNextPage = nullptr; // the unused rest of the newest chunk, and how many pages it is
+    std::size_t m_PagesLeft = 0;
+    std::size_t m_PagesInChunk = 3; // of the next chunk; it grows with what is in use
+    Chunk* m_pChunks = nullptr;     // newest first
+};
+
+#endif
