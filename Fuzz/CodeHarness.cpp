@@ -137,6 +137,8 @@ private:
     std::string& m_Text;
 };
 
+constexpr int MostMessageLines = 12; // of a compiler
+
 const char* const HarnessHead = R"(#include <stdio.h>
 #include <stdint.h>
 #include <stdbool.h>
@@ -209,14 +211,35 @@ std::string describeTrace(const Trace& Told, const Program& Source) {
 void CodeBatch::add(std::string Name, CodePair Code) {
     const std::size_t End = Code.Harness.find("_table[]");
     const std::size_t Start = Code.Harness.rfind(' ', End) + 1;
-    m_Entries.push_back(
-        {std::move(Name), Code.Harness.substr(Start, End + 1 - Start), std::move(Code.Expected)});
-    m_Source += Code.Unoptimised + Code.Optimised + Code.Harness;
+    m_Entries.push_back({std::move(Name), Code.Harness.substr(Start, End + 1 - Start),
+                         std::move(Code.Expected),
+                         Code.Unoptimised + Code.Optimised + Code.Harness});
 }
 
 std::string CodeBatch::run(const std::string& Directory, const std::string& RuntimeDirectory) {
-    std::string Source = HarnessHead + m_Source + "int main(void) {\n";
-    for (const Entry& Each : m_Entries)
+    std::string Difference = compileAndRun(m_Entries, Directory, RuntimeDirectory);
+    // Where nothing ran, any of them can be to blame.
+    for (std::size_t i = 0; i < m_Entries.size() && m_Entries.size() > 1; ++i) {
+        if (Difference.empty())
+            break;
+        std::string Alone = compileAndRun({m_Entries[i]}, Directory, RuntimeDirectory);
+        if (!Alone.empty()) {
+            Difference = std::move(Alone);
+            break;
+        }
+    }
+    m_Entries.clear();
+    return Difference;
+}
+
+std::string CodeBatch::compileAndRun(const std::vector<Entry>& Entries,
+                                     const std::string& Directory,
+                                     const std::string& RuntimeDirectory) {
+    std::string Source = HarnessHead;
+    for (const Entry& Each : Entries)
+        Source += Each.Source;
+    Source += "int main(void) {\n";
+    for (const Entry& Each : Entries)
         Source += "    " + Each.Prefix + "run();\n";
     Source += "    printf(\"\\n# end\\n\");\n    return 0;\n}\n";
     std::ofstream(Directory + "/batch.c", std::ios::binary) << Source;
@@ -225,17 +248,21 @@ std::string CodeBatch::run(const std::string& Directory, const std::string& Runt
         "' batch.c -o batch >messages 2>&1 && timeout 120 ./batch";
     int Status = 0;
     const std::string Output = hostshell::run(Command, Status);
-    std::string Difference = checkOutput(Output);
+    std::string Difference = checkOutput(Entries, Output);
     if (Difference.empty() && Status != 0)
         Difference =
-            m_Entries.front().Name + "\nthe batch ended with status " + std::to_string(Status);
-    m_Entries.clear();
-    m_Source.clear();
+            Entries.front().Name + "\nthe batch ended with status " + std::to_string(Status);
+    if (!Difference.empty()) { // what the compiler says of it, if it says anything
+        std::ifstream Messages(Directory + "/messages", std::ios::binary);
+        std::string Line;
+        for (int i = 0; i < MostMessageLines && std::getline(Messages, Line); ++i)
+            Difference += '\n' + Line;
+    }
     return Difference;
 }
 
-std::string CodeBatch::checkOutput(const std::string& Output) const {
-    for (const Entry& Each : m_Entries) {
+std::string CodeBatch::checkOutput(const std::vector<Entry>& Entries, const std::string& Output) {
+    for (const Entry& Each : Entries) {
         for (const char* pVariant : {"a", "b"}) {
             const std::string Head = "\n# " + Each.Prefix + pVariant;
             const std::size_t Start = Output.find(Head + "\n");

@@ -26,7 +26,8 @@ public:
     void add(std::string Name, CodePair Code);
     std::size_t size() const { return m_Entries.size(); }
     /// Compiles and runs all in a directory that exists. Empty if every variant printed what was
-    /// expected, else the name of the first program that did not, a line end, and what differs. The
+    /// expected, else the name of the first program that did not, a line end, what differs, and
+    /// what the compiler said. Where the whole does not compile, each program is tried alone. The
     /// batch is empty afterwards.
     std::string run(const std::string& Directory, const std::string& RuntimeDirectory);
     static std::string prefixOf(std::size_t Number) { return "p" + std::to_string(Number) + "_"; }
@@ -36,11 +37,14 @@ private:
         std::string Name;
         std::string Prefix;
         std::string Expected;
+        std::string Source;
     };
-    std::string checkOutput(const std::string& Output) const;
+    static std::string compileAndRun(const std::vector<Entry>& Entries,
+                                     const std::string& Directory,
+                                     const std::string& RuntimeDirectory);
+    static std::string checkOutput(const std::vector<Entry>& Entries, const std::string& Output);
 
     std::vector<Entry> m_Entries;
-    std::string m_Source;
 };
 
 } // namespace hpn::fuzz

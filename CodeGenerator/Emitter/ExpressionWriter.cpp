@@ -243,13 +243,17 @@ ExpressionWriter::Piece ExpressionWriter::call(const char* Name, int Left, int R
 /// has it.
 ExpressionWriter::Piece ExpressionWriter::infix(int Left, int Right, const char* Sign,
                                                 Precedence Binding, CType Type, bool KeepZeroSign) {
+    const bool IsArithmetic = Binding == Sum || Binding == Product;
+    const auto operand = [&](int Index) {
+        const bool IsCompared = !IsArithmetic && m_Nodes[Index].Op != Operator::Number;
+        return IsCompared ? compared(Index) : operandAsDouble(Index, KeepZeroSign);
+    };
     const std::size_t Start = m_Out.size();
-    Piece First = operandAsDouble(Left, KeepZeroSign);
+    Piece First = operand(Left);
     const std::size_t AfterFirst = m_Out.size();
     m_Out += Sign;
     const std::size_t StartOfSecond = m_Out.size();
-    const Piece Second = operandAsDouble(Right, KeepZeroSign);
-    const bool IsArithmetic = Binding == Sum || Binding == Product;
+    const Piece Second = operand(Right);
     bindBeside(StartOfSecond, Second, static_cast<Precedence>(IsArithmetic ? Binding + 1 : Sum));
     // C computes in the wider of the two types, which must not be float or an integer type.
     const bool NeedsCast = First.Type != CType::Double && Second.Type != CType::Double &&
