@@ -9,11 +9,11 @@
 //   RoadTimer PROGRAM.hpn [RUNS]      (default: 2 runs)
 
 #include "Emitter/CEmitter.h"
+#include "Graph/ProcessMemory.h"
 #include "Graph/ProgramGraph.h"
 #include "Language/Reader.h"
 #include "Model/PendingWarnings.h"
 #include "Road/PassSequence.h"
-#include "ZfCPooledMemController.h"
 
 #include <malloc.h>
 #include <sys/resource.h>
@@ -85,7 +85,10 @@ void runOnce(const char* FileName, Figures& Taken) {
     if (!IsRead)
         std::exit(1);
     hpn::ProgramGraph* pGraph = nullptr;
-    Taken.time("build", [&] { pGraph = new hpn::ProgramGraph(Source); });
+    Taken.time("build", [&] {
+        pGraph = new hpn::ProgramGraph(Source);
+        Source.dropBodies(); // as in the driver
+    });
     double Road = 0.0;
     const hpn::PassSequence Passes = hpn::PassSequence::defaultOrder();
     for (const hpn::PassId Id : Passes.getPasses()) {
@@ -111,9 +114,7 @@ int main(int ArgumentCount, char** pArguments) {
         std::fprintf(stderr, "usage: RoadTimer PROGRAM.hpn [RUNS]\n");
         return 2;
     }
-    // As in the driver.
-    static ZfCPooledMemController s_Memory;
-    pZFMemory = &s_Memory;
+    hpn::usePooledMemory(); // as in the driver
     const char* Separator = "[";
     for (int Run = 0; Run < Runs; ++Run) {
         Figures Taken;

@@ -1,6 +1,6 @@
 #include "Driver/Options.h"
 #include "Driver/Session.h"
-#include "ZfCPooledMemController.h"
+#include "Graph/ProcessMemory.h"
 
 #include <cstdio>
 #include <cstdlib>
@@ -36,8 +36,7 @@ void setStreamsToBytes() {
 // The driver of the reference client: program text in, optimised C out.
 int main(int ArgumentCount, char** pArguments) {
     std::set_new_handler(&endWithoutMemory);
-    static ZfCPooledMemController s_Memory; // to the very end: the graph's records lie in it
-    pZFMemory = &s_Memory;
+    hpn::usePooledMemory();
     setStreamsToBytes();
     try {
         hpn::Options Wanted;

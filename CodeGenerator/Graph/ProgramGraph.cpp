@@ -39,6 +39,8 @@ void ProgramGraph::takeDown() {
     m_pGraph.reset();
     m_Variables.clear();
     m_Control.shutdown();
+    // The next graph's memory is in order again, and its program's text may have it first.
+    leda::std_memory_mgr.release_chunks();
 }
 
 ZfCCfgSFVariable* ProgramGraph::getVariable(const Variable& Declaration) const {

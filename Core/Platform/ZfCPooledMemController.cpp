@@ -11,11 +11,22 @@ constexpr std::size_t s_MostPagesInChunk = 63;
 } // namespace
 
 ZfCPooledMemController::~ZfCPooledMemController() {
+    releaseChunks();
+}
+
+void ZfCPooledMemController::releaseChunks() {
     while (m_pChunks != nullptr) {
         Chunk* const pNext = m_pChunks->pNext;
         std::free(m_pChunks);
         m_pChunks = pNext;
     }
+    for (std::size_t Class = 0; Class < s_Classes; ++Class) {
+        m_pFree[Class] = nullptr;
+        m_pCursor[Class] = m_pEnd[Class] = nullptr;
+    }
+    m_pNextPage = nullptr;
+    m_PagesLeft = 0;
+    m_PagesInChunk = s_PagesInFirstChunk;
 }
 
 ZfCPooledMemController::Header* ZfCPooledMemController::headerOf(void* pBlock) {
@@ -36,9 +47,12 @@ void* ZfCPooledMemController::allocMemBlock(unsigned int Size) {
     const std::size_t Class = Size != 0 ? (Size + s_Granule - 1) / s_Granule : 1;
     if (FreeBlock* const pBlock = m_pFree[Class]) {
         m_pFree[Class] = pBlock->pNext;
+        ++m_Live;
         return pBlock;
     }
-    return allocateFromPage(Class);
+    void* const pBlock = allocateFromPage(Class);
+    m_Live += pBlock != nullptr ? 1 : 0;
+    return pBlock;
 #endif
 }
 
@@ -54,6 +68,8 @@ void ZfCPooledMemController::freeMemBlock(void* pBlock) {
         return;
     }
     m_pFree[pHeader->Class] = ::new (pBlock) FreeBlock{m_pFree[pHeader->Class]};
+    if (--m_Live == 0)
+        releaseChunks();
 #endif
 }
 
@@ -71,8 +87,7 @@ void* ZfCPooledMemController::allocateFromPage(std::size_t Class) {
     if (static_cast<std::size_t>(m_pEnd[Class] - m_pCursor[Class]) < Bytes) {
         if (m_PagesLeft == 0 && !addChunk())
             return nullptr;
-        m_pCursor[Class] =
-            reinterpret_cast<char*>(::new (m_pNextPage) Header{nullptr, Class} + 1);
+        m_pCursor[Class] = reinterpret_cast<char*>(::new (m_pNextPage) Header{nullptr, Class} + 1);
         m_pEnd[Class] = m_pNextPage + s_PageBytes;
         m_pNextPage += s_PageBytes;
         --m_PagesLeft;

@@ -11,7 +11,8 @@
 //
 // Blocks up to 1024 bytes lie in pages of one size each; a page is aligned, so that a block finds
 // its size by its address. Larger ones come from malloc one by one. Pages stay with the controller
-// for later blocks of their size and go with it. Allocation and release cost a few instructions.
+// for later blocks of their size until the last small block is given back; then all of them go, and
+// the next run finds its memory in order. Allocation and release cost a few instructions.
 // One thread at a time, like the library. Under the address sanitizer every block is malloc's own.
 class HPNPLATFORM_EXPORT ZfCPooledMemController : public ZfCMemController {
 public:
@@ -30,6 +31,7 @@ private:
     static constexpr std::size_t s_Granule = 16;
     static constexpr std::size_t s_GreatestSmall = 1024;
     static constexpr std::size_t s_PageBytes = 64 * 1024;
+    static constexpr std::size_t s_PagesInFirstChunk = 3;
 
     // At the begin of each page and of each large block.
     struct alignas(s_Granule) Header {
@@ -48,15 +50,18 @@ private:
     static void* allocateLarge(std::size_t Size);
     void* allocateFromPage(std::size_t Class);
     bool addChunk();
+    void releaseChunks();
 
     static constexpr std::size_t s_Classes = s_GreatestSmall / s_Granule + 1;
+    std::size_t m_Live = 0;             // small blocks given out
     FreeBlock* m_pFree[s_Classes] = {}; // by class: blocks given back
     char* m_pCursor[s_Classes] = {};    // by class: the unused rest of its newest page
     char* m_pEnd[s_Classes] = {};
     char* m_pNextPage = nullptr; // the unused rest of the newest chunk, and how many pages it is
     std::size_t m_PagesLeft = 0;
-    std::size_t m_PagesInChunk = 3; // of the next chunk; it grows with what is in use
-    Chunk* m_pChunks = nullptr;     // newest first
+    std::size_t m_PagesInChunk =
+        s_PagesInFirstChunk;    // of the next chunk; it grows with what is in use
+    Chunk* m_pChunks = nullptr; // newest first
 };
 
 #endif

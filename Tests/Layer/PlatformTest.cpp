@@ -221,8 +221,14 @@ TEST(MemoryController, PooledBlocksServeAgain) {
     void* const pSecond = Controller.allocMemBlock(48);
     EXPECT_EQ(static_cast<char*>(pSecond) - static_cast<char*>(pFirst), 48);
     Controller.freeMemBlock(pFirst);
-    EXPECT_NE(Controller.allocMemBlock(64), pFirst);
+    void* const pOther = Controller.allocMemBlock(64);
+    EXPECT_NE(pOther, pFirst);
     EXPECT_EQ(Controller.allocMemBlock(33), pFirst);
+    // After the last one it begins anew.
+    for (void* pBlock : {pFirst, pSecond, pOther})
+        Controller.freeMemBlock(pBlock);
+    void* const pAgain = Controller.allocMemBlock(48);
+    EXPECT_EQ(static_cast<char*>(Controller.allocMemBlock(48)) - static_cast<char*>(pAgain), 48);
 }
 #endif
 
