@@ -267,8 +267,16 @@ std::string describe(const KnownVersion& Of) {
     return Of.Name + " (Var_" + std::to_string(Of.Serial) + ")";
 }
 
-// A version that is missing in the narrow program stands in code that is dead there.
+// A version that is missing in the narrow program stands in code that is dead there. Where the
+// narrow program leaves a version undetermined that the wide one knows (it depends on nothing but
+// itself there, round a loop), evaluation takes all numbers of its type for it, and the wide
+// program may well conclude more from its range.
 std::string compareWidened(const TrialResult& Narrow, const TrialResult& Wide) {
+    for (const KnownVersion& Each : Wide.Versions) {
+        const KnownVersion* pOther = findVersion(Narrow.Versions, Each.Serial);
+        if (pOther != nullptr && pOther->IsUndetermined && !Each.IsUndetermined)
+            return {};
+    }
     for (const KnownVersion& Each : Wide.Versions) {
         const KnownVersion* pOther = findVersion(Narrow.Versions, Each.Serial);
         if (!Each.IsConstant || pOther == nullptr || pOther->IsUndetermined)
@@ -304,7 +312,9 @@ std::string compareTwice(const TrialResult& Once, const TrialResult& Twice) {
         const KnownVersion* pLater = findVersion(Twice.Versions, Each.Serial);
         const bool IsSameConstant =
             pLater != nullptr && pLater->IsConstant && isSame(pLater->Number, Each.Number);
-        if (Each.IsConstant && pLater != nullptr && !IsSameConstant)
+        // What only a call defined that is dead by now is undetermined again.
+        const bool IsLost = pLater != nullptr && !pLater->IsUndetermined && !IsSameConstant;
+        if (Each.IsConstant && IsLost)
             return describe(Each) + " was constant the first time alone";
         IsNew = IsNew || pLater == nullptr || (!Each.IsConstant && pLater->IsConstant) ||
                 !isSame(Each.Number, pLater->Number) || !isSame(Each.Highest, pLater->Highest);
