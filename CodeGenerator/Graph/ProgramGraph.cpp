@@ -78,20 +78,26 @@ const std::string& ProgramGraph::readableNameOf(const std::string& ProcedureName
     return Found != m_Extracted.end() ? Found->second : ProcedureName;
 }
 
-void ProgramGraph::appendCalls() {
+std::vector<ZfCCfgProcedureCall*> ProgramGraph::listCalls() const {
+    std::vector<ZfCCfgProcedureCall*> Calls;
     for (leda::node v = m_pGraph->first_node(); v != m_pGraph->stop_node();
          v = m_pGraph->next_node(v)) {
-        ZfCBasicBlock* pBlock = (*m_pGraph)[v]->isBasicBlock();
+        ZfCBasicBlock* pBlock = m_pGraph->inf(v)->isBasicBlock();
         if (pBlock == nullptr)
             continue;
         for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq()) {
-            ZfCCfgProcedureCall* pCall = pStatement->isProcedureCall();
-            if (pCall == nullptr)
-                continue;
-            ZfCCfgProcedure* pCallee = nullptr;
-            m_pGraph->demandProcedureEntryNode(pCall->getName(), pCallee);
-            pCallee->appendCall(pCall);
+            if (ZfCCfgProcedureCall* pCall = pStatement->isProcedureCall())
+                Calls.push_back(pCall);
         }
+    }
+    return Calls;
+}
+
+void ProgramGraph::appendCalls() {
+    for (ZfCCfgProcedureCall* pCall : listCalls()) {
+        ZfCCfgProcedure* pCallee = nullptr;
+        m_pGraph->demandProcedureEntryNode(pCall->getName(), pCallee);
+        pCallee->appendCall(pCall);
     }
 }
 

@@ -82,6 +82,8 @@ public:
     const std::string& readableNameOf(const std::string& ProcedureName) const;
     /// What the passes remarked about the program so far, for the user.
     std::vector<Remark>& getRemarks() { return m_Remarks; }
+    /// All calls on the graph, in the order of its nodes.
+    std::vector<ZfCCfgProcedureCall*> listCalls() const;
     /// Registers every call on the graph at its callee (for a road without `inlineProcedures`,
     /// which does it itself).
     void appendCalls();

@@ -35,18 +35,6 @@ Finding findingOf(ZfCCfgVariable* pVersion) {
     return Result;
 }
 
-Finding join(const Finding& a, const Finding& b) {
-    using Kind = Finding::Kind;
-    if (a.What == Kind::Undetermined || b.What == Kind::Undetermined)
-        return {};
-    if (a.What == Kind::Anything || b.What == Kind::Anything)
-        return {Kind::Anything, 0.0, 0.0};
-    const double Low = std::min(a.Low, b.Low);
-    const double High = std::max(a.High, b.High);
-    const bool IsOne = a.What == Kind::Constant && b.What == Kind::Constant && Low == High;
-    return {IsOne ? Kind::Constant : Kind::Range, Low, High};
-}
-
 // Fills origin and place from the defining statement.
 void describeDefinition(ZfCCfgStatement* pStatement, const Variable& Declaration,
                         VersionFinding& Result) {
@@ -197,7 +185,7 @@ Finding RangeRow::summary() const {
         return {};
     Finding Result = Versions.front().Found;
     for (const VersionFinding& Version : Versions)
-        Result = join(Result, Version.Found);
+        Result = joinFindings(Result, Version.Found);
     return Result;
 }
 

@@ -4,6 +4,7 @@
 #include "Language/Program.h"
 #include "Road/PassRunner.h"
 
+#include <algorithm>
 #include <string>
 #include <vector>
 
@@ -25,6 +26,21 @@ struct Finding {
 
     std::string toText() const;
 };
+
+/// What is found where one of two values arrives: the hull, and nothing while one of them is
+/// undetermined. For `Finding` and structures of its shape.
+template <class TFinding>
+TFinding joinFindings(const TFinding& a, const TFinding& b) {
+    using Kind = typename TFinding::Kind;
+    if (a.What == Kind::Undetermined || b.What == Kind::Undetermined)
+        return {Kind::Undetermined, 0.0, 0.0};
+    if (a.What == Kind::Anything || b.What == Kind::Anything)
+        return {Kind::Anything, 0.0, 0.0};
+    const double Low = std::min(a.Low, b.Low);
+    const double High = std::max(a.High, b.High);
+    const bool IsOne = a.What == Kind::Constant && b.What == Kind::Constant && Low == High;
+    return {IsOne ? Kind::Constant : Kind::Range, Low, High};
+}
 
 /// One definition of a variable and what its version was found to be.
 struct VersionFinding {

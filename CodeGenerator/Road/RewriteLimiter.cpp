@@ -128,21 +128,10 @@ void RewriteLimiter::beforePass(const PassStep& Step, ProgramGraph& Graph) {
 }
 
 void RewriteLimiter::holdBackCalls(ProgramGraph& Program) {
-    ZfCControlFlowGraph& Graph = Program.getGraph();
+    const std::vector<ZfCCfgProcedureCall*> Calls = Program.listCalls();
     std::map<std::string, unsigned> Counts;
-    std::vector<ZfCCfgProcedureCall*> Calls;
-    for (leda::node v = Graph.first_node(); v != nullptr; v = Graph.next_node(v)) {
-        ZfCBasicBlock* pBlock = Graph.inf(v)->isBasicBlock();
-        if (pBlock == nullptr)
-            continue;
-        for (ZfCCfgStatement* pStatement : pBlock->getStatementSeq()) {
-            ZfCCfgProcedureCall* pCall = pStatement->isProcedureCall();
-            if (pCall == nullptr)
-                continue;
-            ++Counts[pCall->getName().cstring()];
-            Calls.push_back(pCall);
-        }
-    }
+    for (ZfCCfgProcedureCall* pCall : Calls)
+        ++Counts[pCall->getName().cstring()];
     for (ZfCCfgProcedureCall* pCall : Calls) {
         if (pCall->isCallToDirectlyOrIndirectlyFromOutsideCallableFcn() ||
             Counts[pCall->getName().cstring()] != 1)

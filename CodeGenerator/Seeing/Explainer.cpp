@@ -5,6 +5,7 @@
 #include "Model/ZfCCfgSFAssignment.h"
 #include "Model/ZfCCfgSFExpression.h"
 #include "Model/ZfCCfgSFProcedureCall.h"
+#include "Road/RangeTable.h"
 #include "Seeing/LoopHeads.h"
 
 #include <algorithm>
@@ -41,17 +42,6 @@ RecordedRange rangeOf(const ValueRange& Range) {
     if (Range.isSingle())
         return {Kind::Constant, Range.Low, Range.Low};
     return {Kind::Range, Range.Low, Range.High};
-}
-
-RecordedRange hullOf(const RecordedRange& a, const RecordedRange& b) {
-    if (a.What == Kind::Undetermined || b.What == Kind::Undetermined)
-        return {Kind::Undetermined, 0.0, 0.0};
-    if (a.What == Kind::Anything || b.What == Kind::Anything)
-        return {Kind::Anything, 0.0, 0.0};
-    const double Low = std::min(a.Low, b.Low);
-    const double High = std::max(a.High, b.High);
-    const bool IsOne = a.What == Kind::Constant && b.What == Kind::Constant && Low == High;
-    return {IsOne ? Kind::Constant : Kind::Range, Low, High};
 }
 
 // Every statement and phi function, in order of the nodes.
@@ -374,7 +364,7 @@ private:
                 if (!version(Index).IsReached)
                     continue;
                 Each.Found =
-                    IsFirst ? version(Index).Found : hullOf(Each.Found, version(Index).Found);
+                    IsFirst ? version(Index).Found : joinFindings(Each.Found, version(Index).Found);
                 IsFirst = false;
             }
             if (!Each.NotTracked.empty())
