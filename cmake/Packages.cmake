@@ -27,6 +27,8 @@ set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS
   "${CPACK_DEBIAN_LIBRARY_PACKAGE_NAME} (= ${PROJECT_VERSION}), libstdc++-12-dev | libstdc++-dev")
 set(CPACK_DEBIAN_TOOLS_PACKAGE_NAME hpnssa-tools)
 set(CPACK_DEBIAN_TOOLS_PACKAGE_SECTION devel)
+# hpncg --report draws with it, and does without.
+set(CPACK_DEBIAN_TOOLS_PACKAGE_RECOMMENDS graphviz)
 set(CPACK_COMPONENT_LIBRARY_DESCRIPTION
   "Shared libraries\n The optimising middle of a production code generator for embedded controllers:\n whole programs in static single assignment form, constants with ranges over\n fixed-point variables, dead code, inlining, hoisting.")
 set(CPACK_COMPONENT_DEVELOPMENT_DESCRIPTION
