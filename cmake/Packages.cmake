@@ -20,6 +20,7 @@ set(CPACK_DEBIAN_PACKAGE_SHLIBDEPS ON)
 set(CPACK_DEBIAN_PACKAGE_GENERATE_SHLIBS ON)
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_NAME libhpnssa${PROJECT_VERSION_MAJOR})
 set(CPACK_DEBIAN_LIBRARY_PACKAGE_SECTION libs)
+set(CPACK_DEBIAN_LIBRARY_PACKAGE_CONTROL_EXTRA ${CMAKE_CURRENT_LIST_DIR}/triggers)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_NAME libhpnssa-dev)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SECTION libdevel)
 set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_SHLIBDEPS OFF)
@@ -27,10 +28,12 @@ set(CPACK_DEBIAN_DEVELOPMENT_PACKAGE_DEPENDS
   "${CPACK_DEBIAN_LIBRARY_PACKAGE_NAME} (= ${PROJECT_VERSION}), libstdc++-12-dev | libstdc++-dev")
 set(CPACK_DEBIAN_TOOLS_PACKAGE_NAME hpnssa-tools)
 set(CPACK_DEBIAN_TOOLS_PACKAGE_SECTION devel)
+# hpncg --report draws with it, and does without.
+set(CPACK_DEBIAN_TOOLS_PACKAGE_RECOMMENDS graphviz)
 set(CPACK_COMPONENT_LIBRARY_DESCRIPTION
-  "Shared libraries\n The optimising middle of a production code generator for embedded controllers:\n whole programs in static single assignment form, constants with ranges over\n fixed-point variables, dead code, inlining, hoisting.")
+  "Shared libraries\nThe optimising middle of a production code generator for embedded controllers:\nwhole programs in static single assignment form, constants with ranges over\nfixed-point variables, dead code, inlining, hoisting.")
 set(CPACK_COMPONENT_DEVELOPMENT_DESCRIPTION
-  "Headers and static libraries\n What is needed to build a client of HpnSSA: headers, static libraries, the\n CMake package and the pkg-config file.")
+  "Headers and static libraries\nWhat is needed to build a client of HpnSSA: headers, static libraries, the\nCMake package and the pkg-config file.")
 set(CPACK_COMPONENT_TOOLS_DESCRIPTION
-  "Code generator for control programs\n hpncg reads control programs in a typed language, optimises them as a whole and\n writes readable C99 whose outputs are bit for bit those of the program as\n written.")
+  "Code generator for control programs\nhpncg reads control programs in a typed language, optimises them as a\nwhole and writes readable C99 whose outputs are bit for bit those of the\nprogram as written.")
 include(CPack)

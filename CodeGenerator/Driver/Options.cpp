@@ -181,6 +181,8 @@ std::string checkOptions(const CLI::App& App, const Words& Given, Options& Resul
 bool parseOptions(int ArgumentCount, const char* const* pArguments, Options& Result,
                   ExitStatus& Status) {
     CLI::App App(Description, "hpncg");
+    // A word that begins with a slash names a file on every system.
+    App.allow_windows_style_options(false);
     App.footer(describePasses());
     Words Given;
     declareOptions(App, Result, Given);

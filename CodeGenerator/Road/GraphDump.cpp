@@ -5,9 +5,11 @@
 #include "Model/ZfCCfgSFVariable.h"
 #include "ZfCCfgIteratorNodesEdges.h"
 
+#include <algorithm>
 #include <charconv>
 #include <cstdio>
 #include <fstream>
+#include <iterator>
 #include <sstream>
 
 namespace hpn {
@@ -133,12 +135,14 @@ void openTerm(const Term* pTerm, std::vector<Piece>& Stack, std::ostream& Stream
     later(pTerm->pLeft);
 }
 
+// The library writes its dumps as text: a line ends as the system ends it.
 bool endsWith(const std::string& FileName, const std::string& Text) {
     std::ifstream Stream(FileName, std::ios::binary);
-    Stream.seekg(-static_cast<std::streamoff>(Text.size()), std::ios::end);
-    std::string Last(Text.size(), '\0');
-    Stream.read(Last.data(), static_cast<std::streamsize>(Last.size()));
-    return Stream.good() && Last == Text;
+    Stream.seekg(-2 * static_cast<std::streamoff>(Text.size()), std::ios::end);
+    std::string Last{std::istreambuf_iterator<char>(Stream), {}};
+    Last.erase(std::remove(Last.begin(), Last.end(), '\r'), Last.end());
+    return Last.size() >= Text.size() &&
+           Last.compare(Last.size() - Text.size(), Text.size(), Text) == 0;
 }
 
 } // namespace

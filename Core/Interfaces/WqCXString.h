@@ -15,6 +15,7 @@ class HPNPLATFORM_EXPORT WqCXString {
 public:
     // The empty text.
     WqCXString();
+    // A copy has a text of its own; a move leaves the other empty.
     WqCXString(const WqCXString& Other);
     WqCXString(WqCXString&& Other) noexcept;
     // A copy of the text; null counts as empty.
@@ -25,6 +26,7 @@ public:
     WqCXString(unsigned int Number, bool IsHexadecimal, bool IsShortest);
     ~WqCXString();
 
+    // The same for a string that exists; its former text is gone.
     WqCXString& operator=(const WqCXString& Other);
     WqCXString& operator=(WqCXString&& Other) noexcept;
 
@@ -47,8 +49,11 @@ private:
     alignas(8) char m_Data[s_InlineLength + 1];
 };
 
+// Both texts, the right one behind the left one.
 HPNPLATFORM_EXPORT WqCXString operator+(const WqCXString& Left, const WqCXString& Right);
+// Writes the text as it is.
 HPNPLATFORM_EXPORT std::ostream& operator<<(std::ostream& Stream, const WqCXString& Text);
+// Whether both texts have the same characters.
 HPNPLATFORM_EXPORT bool operator==(const WqCXString& Left, const WqCXString& Right);
 inline bool operator!=(const WqCXString& Left, const WqCXString& Right) {
     return !(Left == Right);

@@ -8,7 +8,10 @@
 class HPNPLATFORM_EXPORT ZF_Scaling {
 public:
     virtual ~ZF_Scaling() = default;
+    // The value of one unit of the stored integer; finite and not 0, else the scaling changes
+    // nothing.
     virtual double getLsb() = 0;
+    // The value of the stored integer 0.
     virtual double getOffset() = 0;
 };
 

@@ -20,6 +20,7 @@ public:
     // Line and column count from 1; 0 means unknown.
     ZfCSrcRef(const char* pFile, int Line, int Column)
         : m_pFile(pFile), m_Line(Line), m_Column(Column) {}
+    // What the constructor was given; a null file means that there is none.
     const char* getFile() const { return m_pFile; }
     int getLine() const { return m_Line; }
     int getColumn() const { return m_Column; }
@@ -34,6 +35,7 @@ private:
 // counted, is the server's.
 class HPNPLATFORM_EXPORT ZfCMessageServer {
 public:
+    // The one server; never null, and not the caller's to end.
     static ZfCMessageServer* getMessageServer();
 
     // Delivers a message: severity, number, source reference or null, category, text. Texts are

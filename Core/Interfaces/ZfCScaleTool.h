@@ -12,7 +12,9 @@ class ZF_Scaling;
 // null scaling, and an lsb of 0 or one that is not finite give the value back as it is.
 class HPNPLATFORM_EXPORT ZfCScaleTool {
 public:
+    // The number on the grid of the scaling that is nearest to Value.
     static double findRepresentedValue(double Value, ZF_Scaling* pScaling);
+    // The one next to Value on the side of the stored integer 0.
     static double findRepresentedValueDontRound(double Value, ZF_Scaling* pScaling);
 };
 

@@ -10,6 +10,7 @@
 // is an object of its own that answers no number query, so that it is told apart by isBool alone.
 class HPNPLATFORM_EXPORT ZfCBasicDataType : public ZF_DataType {
 public:
+    // The type of that name; always the same object, never to be ended by the caller.
     static ZfCBasicDataType* float64();
     static ZfCBasicDataType* float32();
     static ZfCBasicDataType* int8();

@@ -13,6 +13,7 @@ class ZfCMessageSink;
 // start and no end.
 class HPNPLATFORM_EXPORT ZfCPlatformMessageServer {
 public:
+    // Takes the place of the error stream for ZfReportAssertion. It returns to the caller.
     using tAssertionHook = void (*)(const char* File, int Line, const char* Condition);
 
     // Takes messages to the given sink, which must stay until it is replaced; null: to the error
@@ -20,6 +21,7 @@ public:
     static ZfCMessageSink* setSink(ZfCMessageSink* pSink);
     // Messages delivered with this severity since the start or the last resetCounts.
     static unsigned int getCount(tagERR_error_severity_etp Severity);
+    // All counts are 0 again.
     static void resetCounts();
 
     // What ShowInternalInfo answers; false at first.

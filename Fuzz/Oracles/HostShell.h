@@ -47,7 +47,11 @@ inline std::string run(const std::string& Command, int& Status) {
     while (!std::filesystem::exists(Name + ".status"))
         std::this_thread::sleep_for(std::chrono::milliseconds(5));
     Status = std::atoi(readFile(Name + ".status").c_str());
-    return readFile(Name + ".output");
+    const std::string Output = readFile(Name + ".output");
+    // A later process may get this one's number, and must not find its answers.
+    std::filesystem::remove(Name + ".output");
+    std::filesystem::remove(Name + ".status");
+    return Output;
 }
 
 /// A new directory, by a name that also the shell understands.

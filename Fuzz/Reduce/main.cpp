@@ -5,12 +5,10 @@
 #include "Language/Reader.h"
 
 #include <cstdio>
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
 #include <iterator>
 #include <string>
-#include <sys/wait.h>
 #include <vector>
 
 // hpnreduce HPNCG PROGRAM CHECK [OPTION]...: the work behind Scripts/reduce.
@@ -24,11 +22,6 @@ std::string quote(const std::string& Word) {
     for (const char Letter : Word)
         Text += Letter == '\'' ? std::string("'\\''") : std::string(1, Letter);
     return Text + "'";
-}
-
-int runCommand(const std::string& Command) {
-    const int Status = std::system(Command.c_str());
-    return WIFEXITED(Status) ? WEXITSTATUS(Status) : 128;
 }
 
 std::string readText(const std::string& Path) {
@@ -79,8 +72,8 @@ public:
         std::error_code Ignored;
         std::filesystem::remove(m_Directory + "/program.c", Ignored);
         std::ofstream(m_Directory + "/program.hpn", std::ios::binary) << Text;
-        const int Status = runCommand(m_Generate);
-        if (Status == 1 || Status == 2 || runCommand(m_Ask) == 0)
+        const int Status = hostshell::status(m_Generate);
+        if (Status == 1 || Status == 2 || hostshell::status(m_Ask) == 0)
             return false;
         m_LastFailing = Text;
         return true;
@@ -88,7 +81,7 @@ public:
 
     // The text with one statement in a line, as it was asked about last.
     std::string printed() {
-        return runCommand(m_Print) == 0 ? readText(m_Directory + "/printed.hpn") : "";
+        return hostshell::status(m_Print) == 0 ? readText(m_Directory + "/printed.hpn") : "";
     }
 
 private:

@@ -51,7 +51,7 @@ public:
     /// The driver of the same build as this test.
     static std::string driver() {
 #ifdef _WIN32
-        return "run-windows-program " HPNCG_PATH;
+        return HPNSSA_SOURCE_DIR "/cmake/windows/run-windows-program " HPNCG_PATH;
 #else
         return HPNCG_PATH;
 #endif

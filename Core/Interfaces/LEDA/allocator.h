@@ -33,6 +33,7 @@ namespace leda {
 // objects may use it before main and at exit. It belongs to one thread, as the whole layer does.
 class memory_manager {
 public:
+    // A block of more bytes than this comes from malloc.
     static constexpr std::size_t max_pooled = 1088;
 
     // A block of at least the given size, never null: when memory runs out the error handler is
@@ -70,6 +71,7 @@ private:
     chunk* m_chunks = nullptr;                         // all chunks, newest first
 };
 
+// The one manager of the process.
 extern HPNPLATFORM_EXPORT memory_manager std_memory_mgr;
 
 inline void* memory_manager::allocate(std::size_t bytes) {
@@ -109,6 +111,8 @@ T* pool_new(Args&&... args) {
     return ::new (std_memory_mgr.allocate(sizeof(T))) T(std::forward<Args>(args)...);
 }
 
+// Ends an object of pool_new and gives its block back. T must be the class it was made as: the
+// block's size is T's.
 template <class T>
 void pool_delete(T* object) {
     object->~T();
@@ -122,6 +126,7 @@ T* pool_allocate_array(std::size_t count) {
     return static_cast<T*>(std_memory_mgr.allocate(count * sizeof(T)));
 }
 
+// Gives the storage of pool_allocate_array back; count is what it was asked for.
 template <class T>
 void pool_deallocate_array(T* first, std::size_t count) {
     std_memory_mgr.deallocate(first, count * sizeof(T));
@@ -130,6 +135,8 @@ void pool_deallocate_array(T* first, std::size_t count) {
 // Lets the standard's containers take their storage from the manager.
 template <class T>
 struct pool_allocator {
+    // What the standard asks of an allocator. It has no state: any object gives back what another
+    // has allocated.
     using value_type = T;
     pool_allocator() = default;
     template <class U>

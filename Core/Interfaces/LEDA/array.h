@@ -21,10 +21,14 @@ HPNPLATFORM_EXPORT void report_bad_bounds(int a, int b, const char* header, int 
 template <class T>
 class array {
 public:
+    // No indices: low() is 0, high() is -1.
     array() = default;
     // Indices 0 to n - 1.
     explicit array(int n) : array(0, n - 1) {}
+    // Indices a to b.
     array(int a, int b) { allocate(a, b, nullptr); }
+    // A copy with elements of its own; a move takes the elements over and leaves the other without
+    // any.
     array(const array& other);
     array(array&& other) noexcept { swap(other); }
     array& operator=(array other) noexcept {
@@ -33,13 +37,18 @@ public:
     }
     ~array() { release(); }
 
+    // The element of an index from low() to high(), which is not checked.
     T& operator[](int i) { return m_elements[std::ptrdiff_t(i) - m_low]; }
     const T& operator[](int i) const { return m_elements[std::ptrdiff_t(i) - m_low]; }
+    // Number of elements, smallest and greatest index; high() is low() - 1 without elements.
     int size() const { return m_size; }
     int low() const { return m_low; }
     int high() const { return m_low + m_size - 1; }
+    // New bounds, 0 to n - 1 or a to b; costs both sizes. References to elements are stale
+    // afterwards.
     void resize(int n) { resize(0, n - 1); }
     void resize(int a, int b);
+    // Exchanges elements and bounds, O(1).
     void swap(array& other) noexcept;
 
 private:

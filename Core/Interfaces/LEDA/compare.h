@@ -34,6 +34,7 @@ int compare(const T& a, const T& b) {
 // An argument that draws the lookup into namespace leda and turns into the element it stands for.
 template <class T>
 struct key_ref {
+    // The element, which must outlive this reference to it.
     const T& value;
     operator const T&() const { return value; }
 };
@@ -77,6 +78,7 @@ int call(const T&, const T&, long) {
 #define LEDA_ORDER_NUMBERS 1
 template <class T>
 struct order_number {
+    // Whether elements have numbers, and the number of one.
     static constexpr bool known = std::is_integral_v<T> && sizeof(T) <= 4;
     static std::int64_t of(const T& x) { return static_cast<std::int64_t>(x); }
 };

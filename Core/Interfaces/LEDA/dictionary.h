@@ -15,9 +15,11 @@ struct ab_tree {}; // names the usual implementation of a dictionary; the layer 
 
 // Position of an entry in a dictionary: stays valid while the entry stays; null behind the end.
 struct ab_tree_node {
+    // The neighbours in ascending order of keys; null at the ends.
     ab_tree_node* succ = nullptr; // in ascending key order
     ab_tree_node* pred = nullptr;
 };
+// The form in which operations take and answer a position.
 using dic_item = ab_tree_node*;
 
 // Sorted dictionary from keys to informations, in the order of a given function or of the key
@@ -52,16 +54,20 @@ class dictionary {
     using position = typename chunks::position;
 
 public:
+    // An order of keys: negative, 0 or positive, as strcmp.
     using comparison = int (*)(const K&, const K&);
 
+    // Empty, in the order of the key type or in the given one.
     dictionary() : m_order(&key_order<K>) {}
     explicit dictionary(comparison cmp) : m_order(cmp) {}
+    // A copy has entries of its own and the same order. Linear.
     dictionary(const dictionary& other) : m_order(other.m_order) { append_all(other); }
     dictionary& operator=(const dictionary& other);
     ~dictionary() { clear(); }
 
     // The item of the key or null.
     dic_item lookup(const K& key) const;
+    // Key and information of an item, which must not be null.
     const K& key(dic_item it) const { return static_cast<entry*>(it)->key; }
     const V& inf(dic_item it) const { return static_cast<entry*>(it)->value; }
     V& inf(dic_item it) { return static_cast<entry*>(it)->value; }
@@ -72,9 +78,12 @@ public:
     void del(const K& key);
     void del_item(dic_item it) { del(key(it)); }
 
+    // Number of entries.
     int size() const { return m_index.size(); }
     bool empty() const { return m_index.size() == 0; }
+    // Removes all entries; every item is stale afterwards.
     void clear();
+    // Items in ascending order of keys; null at the end.
     dic_item first_item() const { return m_first; }
     dic_item next_item(dic_item it) const { return it ? it->succ : nullptr; }
 

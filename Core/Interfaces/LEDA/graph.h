@@ -118,9 +118,11 @@ class GRAPH : public graph {
                   "records are pointers or values of that size");
 
 public:
+    // Empty. The numbers of the second form reserve nothing.
     GRAPH() = default;
     GRAPH(int n, int m) : graph(n, m) {}
 
+    // The record of a node or an edge, to be read or written. The handle must be one of this graph.
     const N& inf(node v) const { return *record<N>(v->m_record); }
     const E& inf(edge e) const { return *record<E>(e->m_record); }
     N& operator[](node v) { return *record<N>(v->m_record); }

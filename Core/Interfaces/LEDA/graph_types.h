@@ -10,6 +10,7 @@ namespace leda {
 class graph;
 struct node_struct;
 struct edge_struct;
+// Handles of nodes and edges; null is none. They belong to their graph.
 using node = node_struct*;
 using edge = edge_struct*;
 
@@ -20,6 +21,7 @@ using edge = edge_struct*;
 // and the other ones alike; all stop values are null. Only a graph makes, links and destroys nodes.
 struct node_struct {
 public:
+    // First and last out-edge, first in-edge; null if there is none.
     edge first_out_edge() const { return m_first_out; }
     edge stop_out_edge() const { return nullptr; }
     edge first_out_edge_rev() const { return m_last_out; }
@@ -55,6 +57,8 @@ private:
 // record.
 struct edge_struct {
 public:
+    // The neighbours among the source's out-edges, and the next of the target's in-edges; null at
+    // the ends.
     edge next_out_edge() const { return m_next_out; }
     edge pred_out_edge() const { return m_prev_out; }
     edge next_in_edge() const { return m_next_in; }
@@ -96,25 +100,30 @@ inline std::int64_t number_of(int index, unsigned int graph) {
 // sets of nodes look the same in every run.
 template <>
 struct order_number<node> {
+    // As order_number says: index and graph in one number.
     static constexpr bool known = true;
     static std::int64_t of(const node& v) {
         return v ? order_detail::number_of(v->m_index, v->m_graph) : -1;
     }
 };
 
+// The same for edges.
 template <>
 struct order_number<edge> {
+    // As for nodes.
     static constexpr bool known = true;
     static std::int64_t of(const edge& e) {
         return e ? order_detail::number_of(e->m_index, e->m_graph) : -1;
     }
 };
 
+// The same order as a comparison.
 inline int compare(const node& a, const node& b) {
     const std::int64_t left = order_number<node>::of(a), right = order_number<node>::of(b);
     return (left > right) - (left < right);
 }
 
+// The same for edges.
 inline int compare(const edge& a, const edge& b) {
     const std::int64_t left = order_number<edge>::of(a), right = order_number<edge>::of(b);
     return (left > right) - (left < right);

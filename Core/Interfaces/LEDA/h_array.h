@@ -11,10 +11,12 @@ namespace leda {
 
 // Position of an entry in a hashed array: stays valid while the entry stays; null behind the end.
 struct ch_hash_elem {
+    // The neighbours in order of insertion; null at the ends.
     ch_hash_elem* succ = nullptr; // in order of insertion
     ch_hash_elem* pred = nullptr;
     ch_hash_elem* chain = nullptr; // next entry of the same bucket, in an array with an index
 };
+// The form in which operations take and answer a position.
 using h_array_item = ch_hash_elem*;
 
 // Hashed array from pointers, handles or small integers to values, walked in the order of
@@ -34,6 +36,7 @@ class h_array {
     };
 
 public:
+    // Position of an entry.
     using item = h_array_item;
 
     // operator[] makes a missing entry with the default given here, or with V().
@@ -55,15 +58,20 @@ public:
     item fast_insert(const K& key, const V& value);
     // Removes the entry of the key, if there is one.
     void del(const K& key);
+    // Whether the key has an entry.
     bool defined(const K& key) const { return lookup(key) != nullptr; }
 
+    // Key and value of an item, which must not be null.
     const K& key(item it) const { return static_cast<entry*>(it)->key; }
     V& inf(item it) { return static_cast<entry*>(it)->value; }
     const V& inf(item it) const { return static_cast<entry*>(it)->value; }
 
+    // Number of entries.
     int size() const { return m_size; }
     bool empty() const { return m_size == 0; }
+    // Removes all entries; the default stays. Every item is stale afterwards.
     void clear();
+    // Items in order of insertion; null at the end.
     item first_item() const { return m_first; }
     item next_item(item it) const { return it ? it->succ : nullptr; }
 

@@ -13,9 +13,11 @@ namespace leda {
 // Position of an element in a list: stays the same, and valid, while the element stays; null behind
 // the end.
 struct dlink {
+    // The neighbours in the list; null at the ends.
     dlink* succ = nullptr;
     dlink* pred = nullptr;
 };
+// The form in which operations take and answer a position.
 using list_item = dlink*;
 
 // Doubly linked list that owns copies of its elements; each element is one block of the layer's
@@ -36,11 +38,15 @@ class list {
     class walk;
 
 public:
+    // For range-for and for code that asks a container for its types.
     using value_type = T;
     using iterator = walk<T>;
     using const_iterator = walk<const T>;
 
+    // Empty.
     list() = default;
+    // A copy has elements of its own, in the same order; a move takes the elements over with their
+    // items and leaves the other empty.
     list(const list& other) { append_all(other); }
     list(list&& other) noexcept { swap(other); }
     list& operator=(const list& other);
@@ -53,6 +59,7 @@ public:
     // Removes the first or last element and answers it.
     T pop();
     T pop_back();
+    // The first and the last element.
     const T& front() const { return m_first ? element(m_first) : no_front(); }
     T& front() { return m_first ? element(m_first) : no_front(); }
     const T& back() const { return m_last ? element(m_last) : no_back(); }
@@ -74,9 +81,11 @@ public:
     T& operator[](list_item it) { return element(it); }
     const T& operator[](list_item it) const { return element(it); }
 
+    // Number of elements.
     int size() const { return m_size; }
     int length() const { return m_size; }
     bool empty() const { return m_size == 0; }
+    // Destroys all elements; every item is stale afterwards.
     void clear();
 
     // Removes the item and answers its element.
@@ -92,8 +101,10 @@ public:
     list_item search(const T& x) const;
     // Stable merge sort, O(n log n), without moving elements: items keep their element.
     void sort(int (*cmp)(const T&, const T&));
+    // Exchanges all elements; items stay valid.
     void swap(list& other) noexcept;
 
+    // The walk of range-for, from the first element to the last.
     iterator begin() { return iterator(m_first); }
     iterator end() { return iterator(nullptr); }
     const_iterator begin() const { return const_iterator(m_first); }

@@ -82,6 +82,7 @@ public:
     // A missing entry is made with the default given here, or with V().
     map() : m_default() {}
     explicit map(const V& dflt) : m_default(dflt) {}
+    // A copy has values of its own and the same default; a move leaves the other empty.
     map(const map& other) : m_default(other.m_default) { copy_from(other); }
     map(map&& other) noexcept : m_default(std::move(other.m_default)) { swap_table(other); }
     map& operator=(const map& other);
@@ -93,8 +94,10 @@ public:
     // The value of the key or null.
     const V* lookup(const K& key) const;
     V* lookup(const K& key) { return const_cast<V*>(std::as_const(*this).lookup(key)); }
+    // Whether the key has an entry; makes none.
     bool defined(const K& key) const { return lookup(key) != nullptr; }
 
+    // Number of entries.
     int size() const { return m_size; }
     bool empty() const { return m_size == 0; }
     // Removes all entries and gives the table back.

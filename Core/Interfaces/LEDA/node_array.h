@@ -16,11 +16,13 @@ public:
     // Bound to a graph, with T() or the given value for each node.
     explicit node_array(const graph& g) { init(g); }
     node_array(const graph& g, const T& x) { init(g, x); }
+    // Binds it to a graph, whatever it was bound to, and renews all values. Linear.
     void init(const graph& g) {
         m_values.resize(0);
         m_values.resize(g.max_node_index() + 1);
     }
     void init(const graph& g, const T& x);
+    // The value of a node of that graph.
     T& operator[](node v) { return m_values[v->index()]; }
     const T& operator[](node v) const { return m_values[v->index()]; }
 
@@ -32,14 +34,17 @@ private:
 template <class T>
 class edge_array {
 public:
+    // Bound to no graph; bound to one, with T() or the given value for each edge.
     edge_array() = default;
     explicit edge_array(const graph& g) { init(g); }
     edge_array(const graph& g, const T& x) { init(g, x); }
+    // Binds it to a graph, whatever it was bound to, and renews all values. Linear.
     void init(const graph& g) {
         m_values.resize(0);
         m_values.resize(g.max_edge_index() + 1);
     }
     void init(const graph& g, const T& x);
+    // The value of an edge of that graph.
     T& operator[](edge e) { return m_values[e->index()]; }
     const T& operator[](edge e) const { return m_values[e->index()]; }
 

@@ -25,8 +25,11 @@ class set;
 class set_item {
 public:
     set_item() = default;
+    // Null.
     set_item(std::nullptr_t) {}
+    // Whether it is not null.
     explicit operator bool() const { return m_slot >= 0; }
+    // Items are equal if both are null or both stand for the same element.
     bool operator==(const set_item& other) const {
         return (m_slot >= 0) == (other.m_slot >= 0) && (m_slot < 0 || m_key == other.m_key);
     }
@@ -55,11 +58,14 @@ class set {
                   "sets hold pointers, handles and numbers");
 
 public:
+    // For range-for; elements are never changed in place.
     using value_type = T;
     class const_iterator;
     using iterator = const_iterator;
 
+    // Empty.
     set() {}
+    // A copy has elements of its own; a move takes them over and leaves the other empty.
     set(const set& other) { copy_from(other); }
     set(set&& other) noexcept { take(other); }
     set& operator=(const set& other);
@@ -70,17 +76,21 @@ public:
     void insert(const T& x);
     void del(const T& x);
     bool member(const T& x) const;
+    // Number of elements.
     int size() const { return m_size; }
     bool empty() const { return m_size == 0; }
+    // Removes all elements; every item is stale afterwards.
     void clear();
 
-    // Union and intersection, in place and as new sets.
+    // Union and intersection, in place.
     void add(const set& other);
     void intersect_with(const set& other);
+    // What at least one of the two has; the operands stay as they are.
     friend set operator+(set a, const set& b) {
         a.add(b);
         return a;
     }
+    // What both have; the operands stay as they are.
     friend set operator&(set a, const set& b) {
         a.intersect_with(b);
         return a;
@@ -93,6 +103,7 @@ public:
     // The element of an item of this set; the reference holds until the set is changed.
     const T& key(set_item it) const { return *element(where(it)); }
 
+    // The walk of range-for, in ascending order.
     const_iterator begin() const;
     const_iterator end() const { return const_iterator(); }
 
@@ -146,6 +157,8 @@ private:
 template <class T, class Impl>
 class set<T, Impl>::const_iterator {
 public:
+    // What the standard asks of a forward iterator. A default one is the end of every walk; two are
+    // equal if they stand on the same element of the same set.
     using iterator_category = std::forward_iterator_tag;
     using value_type = T;
     using difference_type = std::ptrdiff_t;
@@ -153,6 +166,7 @@ public:
     using reference = const T&;
 
     const_iterator() = default;
+    // The element, the next one, and whether both stand on the same.
     const T& operator*() const { return *m_current; }
     const T* operator->() const { return m_current; }
     const_iterator& operator++() {

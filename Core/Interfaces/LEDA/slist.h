@@ -10,8 +10,10 @@ namespace leda {
 
 // Position of an element in a singly linked list.
 struct slink {
+    // The next element; null at the end.
     slink* succ = nullptr;
 };
+// The form in which operations take and answer a position.
 using slist_item = slink*;
 
 // Singly linked list that owns copies of its elements, in the layer's pools. Both ends take
@@ -24,7 +26,9 @@ class slist {
     };
 
 public:
+    // Empty.
     slist() = default;
+    // A copy has elements of its own; a move takes them over and leaves the other empty.
     slist(const slist& other);
     slist(slist&& other) noexcept { swap(other); }
     slist& operator=(slist other) noexcept {
@@ -33,21 +37,28 @@ public:
     }
     ~slist() { clear(); }
 
+    // Adds a copy of the element at the front (push) or at the end (append) and gives its item.
     slist_item push(const T& x);
     slist_item append(const T& x);
     // Removes the first element and answers it.
     T pop();
+    // The first element. Asking an empty list is an error of the handler in LEDA/error.h.
     const T& head() const { return m_first ? element(m_first) : no_head(); }
     T& head() { return m_first ? element(m_first) : no_head(); }
 
+    // Items from the front on; null at the end.
     slist_item first_item() const { return m_first; }
     slist_item next_item(slist_item it) const { return it ? it->succ : nullptr; }
+    // The element of an item, which must not be null.
     const T& contents(slist_item it) const { return element(it); }
     T& operator[](slist_item it) { return element(it); }
 
+    // Number of elements.
     int size() const { return m_size; }
     bool empty() const { return m_size == 0; }
+    // Destroys all elements; every item is stale afterwards.
     void clear();
+    // Exchanges all elements, O(1).
     void swap(slist& other) noexcept;
 
 private:
@@ -63,13 +74,18 @@ private:
 template <class T>
 class stack {
 public:
+    // Puts a copy of the element on top.
     void push(const T& x) { m_elements.push(x); }
     // Removes the top element and answers it.
     T pop() { return m_elements.pop(); }
+    // The top element. Asking an empty stack, or taking from it, is an error of the handler in
+    // LEDA/error.h.
     const T& top() const { return m_elements.head(); }
     T& top() { return m_elements.head(); }
+    // Number of elements.
     bool empty() const { return m_elements.empty(); }
     int size() const { return m_elements.size(); }
+    // Takes all elements away.
     void clear() { m_elements.clear(); }
 
 private:

@@ -18,11 +18,13 @@ namespace leda {
 // pair by pair.
 namespace sorted_arrays {
 
+// Whether two elements have the same bytes, which for these types means that they are equal.
 template <class T>
 bool same(const T& a, const T& b) {
     return std::memcmp(&a, &b, sizeof(T)) == 0;
 }
 
+// The order of the element type: negative, 0 or positive. Equal bytes are not compared further.
 template <class T>
 int order(const T& a, const T& b) {
     return same(a, b) ? 0 : key_order<T>(a, b);
@@ -32,7 +34,9 @@ int order(const T& a, const T& b) {
 template <class T>
 class pair_order {
 public:
+    // The arrays, which must stay as long as the object; their sizes are not needed.
     pair_order(const T* a, int, const T* b, int) : m_a(a), m_b(b) {}
+    // How element i of the first array stands to element j of the second.
     int operator()(std::ptrdiff_t i, std::ptrdiff_t j) const {
         return key_order<T>(m_a[i], m_b[j]);
     }
@@ -46,12 +50,14 @@ private:
 template <class T, int limit>
 class number_order {
 public:
+    // Reads the numbers of as and bs elements, limit at most.
     number_order(const T* a, int as, const T* b, int bs) {
         for (int i = 0; i < as; ++i)
             m_a[i] = order_number<T>::of(a[i]);
         for (int j = 0; j < bs; ++j)
             m_b[j] = order_number<T>::of(b[j]);
     }
+    // How element i of the first array stands to element j of the second.
     int operator()(std::ptrdiff_t i, std::ptrdiff_t j) const {
         return (m_a[i] > m_b[j]) - (m_a[i] < m_b[j]);
     }
@@ -61,6 +67,7 @@ private:
     std::int64_t m_b[limit];
 };
 
+// The faster of the two that the element type has.
 template <class T, int limit>
 using short_order =
     std::conditional_t<order_number<T>::known, number_order<T, limit>, pair_order<T>>;

@@ -22,21 +22,31 @@ class sorted_chunks {
     static_assert(std::is_trivially_copyable_v<E> && alignof(E) <= 8, "entries are moved as bytes");
 
 public:
+    // Entries of a full chunk.
     static constexpr int capacity = 1024 / sizeof(E) < 128 ? int(1024 / sizeof(E)) : 128;
+    // Place of an entry: its chunk and its place in it, both from 0.
     struct position {
+        // Number of the chunk.
         int chunk;
+        // Number of the entry in its chunk.
         int slot;
     };
 
+    // Empty.
     sorted_chunks() = default;
+    // A copy with chunks of its own, each with the same entries.
     sorted_chunks(const sorted_chunks& other);
     sorted_chunks& operator=(const sorted_chunks&) = delete;
     ~sorted_chunks() { clear(); }
 
+    // Number of entries.
     int size() const { return m_size; }
+    // Removes all entries and gives the storage back.
     void clear();
+    // The entry of a position that is valid; the last of a store that is not empty.
     const E& at(position p) const { return m_directory[p.chunk].body->entries[p.slot]; }
     const E& last() const { return at({m_chunks - 1, count(m_chunks - 1) - 1}); }
+    // Whether an entry has this position.
     bool valid(position p) const {
         return p.chunk >= 0 && p.chunk < m_chunks && p.slot >= 0 && p.slot < count(p.chunk);
     }
@@ -56,10 +66,13 @@ public:
     // an insertion keeps the order. Slot 0 is answered for the very first place only.
     template <class Order>
     bool find(const Order& order, position& p) const;
+    // Puts the entry at the position that find gave for it; those behind move on by one.
     void insert(position p, const E& entry);
+    // Removes the entry of the position.
     void erase(position p);
     // Adds behind the last entry.
     void append(const E& entry);
+    // Adds n entries, in their order, behind the last.
     void append(const E* first, int n);
 
     // True if chunks are neither empty nor over-full, the directory and the size agree with them,

@@ -37,11 +37,15 @@ private:
     void resetData() override;
 
 public:
+    // The statements in the order of execution, and the phi functions; valid until the block
+    // changes.
     leda::list<ZfCCfgStatement*> const& getStatementSeq() { return m_StatementSeq; }
     leda::list<ZfCPhiFunction*> const& getPhiFunctions() { return m_PhiFunctions; }
     // The branch condition or null.
     ZfCCfgExpression* getBranchCond() { return m_pBranchCond; }
 
+    // Add to the end of the statements or of the phi functions. The factory still owns what is
+    // added, and the uses and versions of its variables are the caller's to keep in order.
     void append(ZfCCfgStatement* pStmt) { m_StatementSeq.append(pStmt); }
     void append(ZfCPhiFunction* pPhiFunction) { m_PhiFunctions.append(pPhiFunction); }
     void append(leda::list<ZfCCfgStatement*> const& Statements);

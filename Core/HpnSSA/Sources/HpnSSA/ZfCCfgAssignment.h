@@ -10,7 +10,9 @@
 // effects.
 class HPNSSA_EXPORT ZfCCfgAssignment : public ZfCCfgStatement {
 public:
+    // Neither side is set; enters itself in the factory as every statement does.
     ZfCCfgAssignment();
+    // A copy names the same variable and the same expression; see ZfCCfgStatement for who owns it.
     ZfCCfgAssignment(const ZfCCfgAssignment&) = default;
     ZfCCfgAssignment& operator=(const ZfCCfgAssignment&) = default;
 
@@ -28,6 +30,8 @@ public:
     // Folds the constant parts of the right-hand side.
     virtual void foldConstants() = 0;
 
+    // The variable assigned and the expression it gets; null where there is none. Setting one does
+    // not end the former.
     ZfCCfgVariable* getLHS() { return m_pLHS; }
     void setLHS(ZfCCfgVariable* pVariable) { m_pLHS = pVariable; }
     ZfCCfgExpression* getRHS() { return m_pRHS; }

@@ -27,6 +27,7 @@ public:
     ZfCCfgEdgeInfo(const ZfCCfgEdgeInfo&) = default;
     ZfCCfgEdgeInfo& operator=(const ZfCCfgEdgeInfo&) = default;
 
+    // The record as one of these kinds, or null; all three are null for plain control flow.
     virtual ZfCCfgTrueBranch* isTrueBranch();
     virtual ZfCCfgFalseBranch* isFalseBranch();
     virtual ZfCSSAEdge* isSSAEdge();
@@ -35,8 +36,11 @@ public:
     virtual ~ZfCCfgEdgeInfo();
 
 protected:
+    // Not executable, with the next serial number.
     ZfCCfgEdgeInfo();
 
+    // Renew a parked record with the next serial number; empty it for parking. Both make it not
+    // executable.
     virtual void initData();
     virtual void resetData();
 

@@ -15,6 +15,7 @@ public:
     ZfCCfgEntry(const ZfCCfgEntry&) = default;
     ZfCCfgEntry& operator=(const ZfCCfgEntry&) = default;
 
+    // This record.
     ZfCCfgEntry* isEntryNode() override;
 
 private:
@@ -27,6 +28,7 @@ protected:
     void resetData() override;
 
 public:
+    // Shows the node to an SSA visitor.
     virtual void accept(ZfCCfgVisitor* pVisitor);
 
     // Keeps an assignment, which is not owned.

@@ -13,6 +13,7 @@ public:
     ZfCCfgExit(const ZfCCfgExit&) = default;
     ZfCCfgExit& operator=(const ZfCCfgExit&) = default;
 
+    // This record.
     ZfCCfgExit* isExitNode() override;
 
     // Shows the node to an SSA visitor.

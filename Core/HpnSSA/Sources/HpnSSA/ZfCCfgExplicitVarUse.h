@@ -14,6 +14,8 @@ class HPNSSA_EXPORT ZfCCfgExplicitVarUse : public ZfCCfgExpression {
     friend class ZfCCfgFactory;
 
 public:
+    // Holds no variable. EvalToNonConst: nothing may be assumed about the value, whatever the
+    // variables hold.
     ZfCCfgExplicitVarUse();
     explicit ZfCCfgExplicitVarUse(bool EvalToNonConst);
     ZfCCfgExplicitVarUse(const ZfCCfgExplicitVarUse&) = default;
@@ -39,6 +41,7 @@ protected:
     void resetData() override;
 
 public:
+    // Enters a variable as used; one that is held already changes nothing.
     void addVariable(ZfCCfgVariable* pVariable) { m_UsedVariables.insert(pVariable); }
 
 private:

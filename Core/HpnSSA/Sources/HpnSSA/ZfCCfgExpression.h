@@ -73,6 +73,8 @@ public:
     virtual void accept(ZfCCfgVisitor* pVisitor);
 
 protected:
+    // With the next serial number. EvalToNonConst: nothing may be assumed about the value, whatever
+    // the expression holds; false in the first form.
     ZfCCfgExpression();
     explicit ZfCCfgExpression(bool EvalToNonConst);
     virtual ~ZfCCfgExpression();
@@ -80,8 +82,11 @@ protected:
     // Renew a parked object as the constructor with the same arguments would make it.
     virtual void initData(bool EvalToNonConst);
     virtual void initData();
+
+    // Empties the object for parking.
     virtual void resetData();
 
+    // Changes what isMarkedAsEvalToNonConst answers.
     void setEvalToNonConst(bool EvalToNonConst) { m_EvalToNonConst = EvalToNonConst; }
 
 public:

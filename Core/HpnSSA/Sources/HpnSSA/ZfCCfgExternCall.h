@@ -23,7 +23,10 @@ protected:
     ~ZfCCfgExternCall() override;
 
 public:
+    // What the called code may change, in the order of entry and as often as entered; a copy. The
+    // variables are not owned.
     leda::list<ZfCCfgVariable*> getModifiableVariables() { return m_ModifiableVariables; }
+    // Tell of one more variable that the called code reads or may change.
     void appendUsedVariable(ZfCCfgVariable* pVariable) { m_UsedVariables.insert(pVariable); }
     void appendModifiableVariable(ZfCCfgVariable* pVariable) {
         m_ModifiableVariables.append(pVariable);

@@ -11,6 +11,7 @@ public:
     ZfCCfgFalseBranch(const ZfCCfgFalseBranch&) = default;
     ZfCCfgFalseBranch& operator=(const ZfCCfgFalseBranch&) = default;
 
+    // This record.
     ZfCCfgFalseBranch* isFalseBranch() override;
     void accept(ZfCCfgVisitor* pVisitor, leda::edge& Edge) override;
 

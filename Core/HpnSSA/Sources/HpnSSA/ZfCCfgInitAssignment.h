@@ -7,7 +7,9 @@
 // branch condition tells. Its right-hand side stays as it is through constant folding.
 class HPNSSA_EXPORT ZfCCfgInitAssignment : public ZfCCfgAssignment {
 public:
+    // Neither side is set.
     ZfCCfgInitAssignment();
+    // A copy names the same variable and the same expression.
     ZfCCfgInitAssignment(const ZfCCfgInitAssignment&) = default;
     ZfCCfgInitAssignment& operator=(const ZfCCfgInitAssignment&) = default;
 

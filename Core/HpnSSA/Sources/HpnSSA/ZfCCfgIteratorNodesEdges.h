@@ -19,6 +19,8 @@ class HPNSSA_EXPORT ZfCCfgIteratorNodesEdges {
 public:
     HPNSSA_MODULE_BLOCKS
 
+    // A walker for this visitor, which has to stay as long as walks are made. One that is no
+    // ZfCCfgVisitorSSA sees nothing.
     explicit ZfCCfgIteratorNodesEdges(ZfCCfgVisitor* pVisitor);
     virtual ~ZfCCfgIteratorNodesEdges();
 

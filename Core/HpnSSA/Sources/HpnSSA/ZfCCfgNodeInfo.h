@@ -33,12 +33,14 @@ public:
     ZfCCfgNodeInfo(const ZfCCfgNodeInfo&) = default;
     ZfCCfgNodeInfo& operator=(const ZfCCfgNodeInfo&) = default;
 
+    // The record as one of the two kinds without code, or null.
     virtual ZfCCfgEntry* isEntryNode();
     virtual ZfCCfgExit* isExitNode();
     // The variables that the node assigns; one shared empty list for a node without code.
     virtual leda::list<ZfCCfgVariable*> const& getAssignedVariables();
     // The variables that the node uses.
     virtual leda::set<ZfCCfgVariable*, leda::avl_tree> getUsedVariables();
+    // The record as a block of code, or null.
     virtual ZfCBasicBlock* isBasicBlock();
     virtual ~ZfCCfgNodeInfo() = 0;
 
@@ -48,6 +50,7 @@ protected:
     // Takes a new index and nothing else: it relies on resetData having run when the record was
     // parked.
     virtual void initData();
+    // Empties the record for parking: no dominator, no frontier, no procedure.
     virtual void resetData();
 
 public:
@@ -57,10 +60,12 @@ public:
     // The dominance frontier, which the record owns.
     leda::set<leda::node, leda::avl_tree>* getDF() { return &m_pDF; }
 
+    // Written by ZfCControlFlowGraph::computeAllIdoms.
     void setIdom(leda::node Idom) { m_pIdom = Idom; }
     // The immediate dominator, null until it is computed.
     leda::node getIdom() { return m_pIdom; }
 
+    // The passes write it for the nodes that they make, the transformation to SSA form for all.
     void setProcedure(ZfCCfgProcedure* pProcedure) { m_pProcedure = pProcedure; }
     // The procedure that holds the node; not owned.
     ZfCCfgProcedure* getProcedure() { return m_pProcedure; }

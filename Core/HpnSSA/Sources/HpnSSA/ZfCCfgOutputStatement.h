@@ -7,6 +7,7 @@
 // emits no code and cannot be copied. The variable is not owned.
 class HPNSSA_EXPORT ZfCCfgOutputStatement : public ZfCCfgStatement {
 public:
+    // Uses this variable.
     explicit ZfCCfgOutputStatement(ZfCCfgVariable* pVariable);
     ZfCCfgOutputStatement(const ZfCCfgOutputStatement&) = delete;
     ZfCCfgOutputStatement& operator=(const ZfCCfgOutputStatement&) = delete;
@@ -24,6 +25,7 @@ public:
     // Shows the statement to an SSA visitor.
     virtual void acceptStart(ZfCCfgVisitor* pVisitor);
 
+    // The variable used: the original, and from renaming on the version that reaches the end.
     ZfCCfgVariable* getVariable() { return m_pVariable; }
     void setVariable(ZfCCfgVariable* pVariable) { m_pVariable = pVariable; }
 

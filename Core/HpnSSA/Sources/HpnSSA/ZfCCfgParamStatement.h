@@ -14,6 +14,7 @@
 // owned. The table of arguments walks in the order in which the calls were entered.
 class HPNSSA_EXPORT ZfCCfgParamStatement : public ZfCCfgStatement {
 public:
+    // Defines this variable; no call is entered yet.
     explicit ZfCCfgParamStatement(ZfCCfgVariable* pVariable);
     ZfCCfgParamStatement(const ZfCCfgParamStatement&) = delete;
     ZfCCfgParamStatement& operator=(const ZfCCfgParamStatement&) = delete;
@@ -33,6 +34,7 @@ public:
     virtual void acceptStart(ZfCCfgVisitor* pVisitor);
     virtual void acceptEnd(ZfCCfgVisitor* pVisitor);
 
+    // The variable defined: the original, and from renaming on its version.
     ZfCCfgVariable* getVariable() { return m_pVariable; }
     void setVariable(ZfCCfgVariable* pVariable) { m_pVariable = pVariable; }
 

@@ -33,6 +33,7 @@ public:
     WqCXString getName() { return m_Name; }
     void setName(WqCXString Name) { m_Name = Name; }
 
+    // The two nodes that bound it; null until the graph makes them. Neither is owned.
     leda::node getEntryNode() { return m_pEntryNode; }
     void setEntryNode(leda::node EntryNode) { m_pEntryNode = EntryNode; }
     leda::node getExitNode() { return m_pExitNode; }
@@ -52,12 +53,15 @@ public:
     void appendDefinedVariable(ZfCCfgVariable* pVariable) { m_DefinedVariables.insert(pVariable); }
     void appendUsedVariable(ZfCCfgVariable* pVariable) { m_UsedVariables.insert(pVariable); }
 
+    // The definitions at its entry, one for each variable that a call hands over.
     leda::list<ZfCCfgParamStatement*> getParamStatements() { return m_ParamStatements; }
+    // Enters a definition at the entry. The factory owns it.
     void appendParamStatement(ZfCCfgParamStatement* pStmt) { m_ParamStatements.append(pStmt); }
     // The value return statements of all calls of this procedure.
     leda::list<ZfCCfgValueReturnStatement*> getValueReturnStatements() {
         return m_ValueReturnStatements;
     }
+    // Enters a definition behind a call of this procedure. The factory owns it.
     void appendValueReturnStatement(ZfCCfgValueReturnStatement* pStmt) {
         m_ValueReturnStatements.append(pStmt);
     }

@@ -11,6 +11,7 @@ public:
     ZfCCfgTrueBranch(const ZfCCfgTrueBranch&) = default;
     ZfCCfgTrueBranch& operator=(const ZfCCfgTrueBranch&) = default;
 
+    // This record.
     ZfCCfgTrueBranch* isTrueBranch() override;
     void accept(ZfCCfgVisitor* pVisitor, leda::edge& Edge) override;
 

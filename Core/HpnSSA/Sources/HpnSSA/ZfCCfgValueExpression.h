@@ -41,6 +41,7 @@ protected:
     virtual void initData(const ZfCCfgValue& Value);
 
 public:
+    // The value itself, to be read or written.
     ZfCCfgValue& getValue() { return m_Value; }
 
 private:

@@ -9,6 +9,7 @@
 // variable nor expression is owned; the expression must be set before the uses are asked for.
 class HPNSSA_EXPORT ZfCCfgValueReturnStatement : public ZfCCfgStatement {
 public:
+    // Defines this variable; the expression is null at first.
     explicit ZfCCfgValueReturnStatement(ZfCCfgVariable* pVariable);
     ZfCCfgValueReturnStatement(const ZfCCfgValueReturnStatement&) = delete;
     ZfCCfgValueReturnStatement& operator=(const ZfCCfgValueReturnStatement&) = delete;
@@ -28,8 +29,10 @@ public:
     virtual void acceptStart(ZfCCfgVisitor* pVisitor);
     virtual void acceptMiddle(ZfCCfgVisitor* pVisitor);
 
+    // The variable defined behind the call.
     ZfCCfgVariable* getVariable() { return m_pVariable; }
     void setVariable(ZfCCfgVariable* pVariable) { m_pVariable = pVariable; }
+    // What it gets: an expression of the variable at the callee's exit.
     ZfCCfgExpression* getExpression() { return m_pExpression; }
     void setExpression(ZfCCfgExpression* pExpression) { m_pExpression = pExpression; }
 

@@ -69,6 +69,8 @@ public:
     // Whether the variable is an output of the model.
     virtual bool isOutput();
 
+    // The variable as one of the client's or as a version of another, or null. ZfCCfgSFVariable is
+    // the client's own class: the library hands the pointer on and never looks behind it.
     virtual ZfCCfgSFVariable* isSFVariable();
     virtual ZfCSSAVariable* isSSAVariable();
 

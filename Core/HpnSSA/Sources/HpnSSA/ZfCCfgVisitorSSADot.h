@@ -40,6 +40,7 @@ public:
     virtual void visit(ZfCCfgAssignment* pAssignment);
     // Opens FileName + "_SF_" + serial number + ".dot".
     virtual void openFile(WqCXString FileName);
+    // Writes the end of the graph and closes the file.
     virtual void closeFile();
 
     void visitStart(ZfCCfgValueReturnStatement* pStmt) override;
@@ -99,10 +100,14 @@ protected:
         }
     }
 
+    // Whether the simple form is written.
     bool isSimpleOutput() { return m_SimpleOutput; }
 
+    // Where the dump goes; open between openFile and closeFile.
     std::ofstream m_DotStream;
     ZfCControlFlowGraph* m_pCfg; // not owned; finds the nodes of an edge
+    // What the constructor was given: whether SSA edges are written, and whether the form is the
+    // simple one.
     bool m_PrintSSAEdges;
     bool m_SimpleOutput;
     leda::set<ZfCCfgVariable*, leda::avl_tree> m_PrintedVariables; // grows over all walks

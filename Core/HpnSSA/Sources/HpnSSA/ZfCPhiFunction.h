@@ -28,6 +28,7 @@ protected:
     ~ZfCPhiFunction() override;
 
 public:
+    // The variable defined; not owned.
     void setVariable(ZfCCfgVariable* pVariable) { m_pVariable = pVariable; }
     ZfCCfgVariable* getVariable() { return m_pVariable; }
 

@@ -24,6 +24,7 @@ class ZfCControlFlowGraph;
 // added them; any other has every node visited.
 class ZfCPropagationState {
 public:
+    // The graph whose nodes and edges the tables are for.
     using Graph = leda::GRAPH<ZfCCfgNodeInfo*, ZfCCfgEdgeInfo*>;
 
     // SSAEdgesAreComplete: every use of a variable is the end of an SSA edge from its definition.
@@ -39,9 +40,11 @@ public:
 
     // ---- nodes ----
 
+    // Whether control has arrived at the node in this iteration.
     bool isVisited(leda::node v) const { return m_Nodes[m_Graph.index(v)].IsVisited; }
     // Marks a basic block as reached; true at the first arrival.
     bool arriveAt(leda::node v);
+    // Whether the node has code, and whether that is one phi function.
     bool isBasicBlock(leda::node v) const { return m_Nodes[m_Graph.index(v)].IsBlock; }
     bool isPhiFunction(leda::node v) { return described(v).IsPhi; }
     // The one control flow out-edge; null if there is none or more than one.
@@ -66,11 +69,15 @@ public:
 
     // ---- edges ----
 
+    // Whether the edge leads from a definition to a use; whether it is control flow that has been
+    // found to be passable in this iteration.
     bool isSSAEdge(leda::edge e) const { return (m_Edges[m_Graph.index(e)] & IsSSA) != 0; }
     bool isExecutable(leda::edge e) const {
         return (m_Edges[m_Graph.index(e)] & IsExecutable) != 0;
     }
+    // Whether a definition reaches the node; costs the in-edges up to the first SSA edge.
     bool hasSSAInEdge(leda::node v) const;
+    // Control can pass here; stays so until the next beginIteration.
     void setExecutable(leda::edge e) { m_Edges[m_Graph.index(e)] |= IsExecutable; }
 
     // ---- removal ----

@@ -10,6 +10,7 @@ class HPNSSA_EXPORT ZfCSSAControl {
 public:
     HPNSSA_MODULE_BLOCKS
 
+    // Do nothing: there is no state to make or to copy.
     ZfCSSAControl();
     ZfCSSAControl(const ZfCSSAControl&);
     ZfCSSAControl& operator=(const ZfCSSAControl&);

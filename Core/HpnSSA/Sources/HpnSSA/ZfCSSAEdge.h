@@ -12,6 +12,7 @@ public:
     ZfCSSAEdge(const ZfCSSAEdge&) = default;
     ZfCSSAEdge& operator=(const ZfCSSAEdge&) = default;
 
+    // This record.
     ZfCSSAEdge* isSSAEdge() override;
     void accept(ZfCCfgVisitor* pVisitor, leda::edge& Edge) override;
 

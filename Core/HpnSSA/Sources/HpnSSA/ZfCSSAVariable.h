@@ -34,6 +34,7 @@ public:
     double getLowerLimit() override;
     ZfCCfgValue getInitValue() override;
 
+    // This version.
     ZfCSSAVariable* isSSAVariable() override;
 
     // The variable that this is a version of; null while parked.
@@ -42,6 +43,8 @@ public:
     void setOrigVar(ZfCCfgVariable* pVar);
 
 protected:
+    // A version of pVar, or of the original behind it, with pVar's markers; its value and its range
+    // are undetermined, but for markers that make the value non-constant.
     explicit ZfCSSAVariable(ZfCCfgVariable* pVar);
     ~ZfCSSAVariable() override;
 
