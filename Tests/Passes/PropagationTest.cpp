@@ -2,6 +2,7 @@
 
 #include <cmath>
 
+#include "Generators/LibraryProgram.h"
 #include "LibraryClient/TestClient.h"
 #include "Oracles/SSAVerifier.h"
 
@@ -34,7 +35,7 @@ TEST(Propagation, ValuesOfAllDefinitions) {
         {"proc main { while u { x = x * 0; } }", "0 0 0|0 0 0"},
     };
     for (auto& Row : Rows) {
-        std::string Found;
+        std::string Found, Later;
         for (bool RemoveDeadCode : {false, true}) {
             Program P(Row.Text);
             P.input("u");
@@ -43,8 +44,59 @@ TEST(Propagation, ValuesOfAllDefinitions) {
             EXPECT_TRUE(R.silent()) << Row.Text;
             EXPECT_EQ(verifySSA(P.graph()), "") << Row.Text;
             Found += (RemoveDeadCode ? "|" : "") + P.valuesOf("x");
+            // Nothing becomes constant in a second run but what waits for dead operands to go.
+            P.graph().propagateSparseConditionalConstant(true);
+            Later += (RemoveDeadCode ? "|" : "") + P.valuesOf("x");
         }
         EXPECT_EQ(Found, Row.Values) << Row.Text;
+        std::string WithRemoval = Found.substr(Found.find('|') + 1);
+        EXPECT_EQ(Later, WithRemoval + "|" + WithRemoval) << Row.Text;
+    }
+}
+
+// Value and range of all definitions as bits, and the edges that control can take.
+std::string whatIsKnown(Program& P) {
+    std::string Text;
+    for (auto& Item : P.statements())
+        for (ZfCCfgVariable* pVar : Item.second->getDefinedVariables())
+            for (ZfCCfgValue Value : {pVar->getValue(), pVar->getMinValue(), pVar->getMaxValue()}) {
+                double Number = Value.isConstant() ? Value.getValue() : 0;
+                Text += std::to_string(Value.getValueKind()) +
+                        std::string(reinterpret_cast<char const*>(&Number), sizeof Number);
+            }
+    for (leda::edge e : P.graph().all_edges())
+        if (P.graph().inf(e)->isSSAEdge() == nullptr)
+            Text += P.graph().inf(e)->isEdgeExecutable() ? '+' : '-';
+    return Text;
+}
+
+// A node none of whose operands has changed is not visited again. With edges that it has not added
+// itself, a run visits every node each time that control or a change arrives, and knows no more.
+TEST(Propagation, NodesThatAreNotVisitedAgainWouldHaveGivenTheSame) {
+    for (unsigned int Run = 0; Run < 600; ++Run) {
+        std::string Known[2];
+        for (bool VisitsAll : {false, true}) {
+            Program P(LibraryProgram(Run).text());
+            P.input("in1");
+            P.output("o1");
+            P.boolean("f");
+            P.var("s")->Limit = 3;
+            // Limits and numbers without a bound of their own: ranges move where values do not.
+            P.var("c")->Init = ZfCCfgValue(Run % 2 == 0 ? eCfgValueNonConstant : eCfgValueConstant);
+            if (Run % 3 == 0)
+                P.graph().insertValidConditionAssignments();
+            P.toSSA(Run % 4 == 0);
+            P.graph().divideBasicBlock();
+            bool RemovesDeadCode = Run % 5 < 2;
+            if (VisitsAll) {
+                P.graph().addSSAEdges();
+                P.graph().sparseConditionalConstant(RemovesDeadCode);
+            } else {
+                P.graph().propagateSparseConditionalConstant(RemovesDeadCode);
+            }
+            Known[VisitsAll] = whatIsKnown(P);
+        }
+        EXPECT_EQ(Known[0], Known[1]) << "run " << Run;
     }
 }
 
@@ -112,6 +164,38 @@ TEST(Propagation, RangesAreTheHullOfTheOperands) {
                 EXPECT_EQ(Program::show(pVar->getValue()), "bottom");
                 EXPECT_EQ(pVar->getMaxValue().getValue(), 6.0);
             }
+}
+
+// More operands than are sorted on the way, each of them once more by a second way, and one alone
+// that widens the range to either side.
+TEST(Propagation, AWideJoinLooksAtAllItsOperands) {
+    for (int Odd = 0; Odd < 20; ++Odd) {
+        Program P;
+        P.input("u");
+        leda::node Last = P.entry("#main"), Join = P.block("y = x;");
+        for (int i = 0; i < 20; ++i) {
+            leda::node Branch = P.block("? u"), Next = P.block(),
+                       Arm = P.block(i != Odd  ? "x = 3; ? u"
+                                     : Odd % 2 ? "x = 7; ? u"
+                                               : "x = 1; ? u");
+            P.trueEdge(Arm, Join);
+            P.falseEdge(Arm, Join);
+            P.edge(Last, Branch);
+            P.trueEdge(Branch, Arm);
+            P.falseEdge(Branch, Next);
+            Last = Next;
+        }
+        P.edge(Last, P.block());
+        P.propagate(false);
+        EXPECT_NE(P.valuesOf("x").find("bottom"), std::string::npos) << Odd;
+        ZfCCfgVariable* pMerged = nullptr;
+        for (auto& Item : P.statements())
+            if (Item.second->isPhiFunction() && P.graph().indeg(Item.first) >= 40)
+                pMerged = Item.second->isPhiFunction()->getVariable();
+        ASSERT_NE(pMerged, nullptr);
+        EXPECT_EQ(pMerged->getMinValue().getValue(), Odd % 2 ? 3 : 1) << Odd;
+        EXPECT_EQ(pMerged->getMaxValue().getValue(), Odd % 2 ? 7 : 3) << Odd;
+    }
 }
 
 TEST(Propagation, ASecondRunDoublesTheSSAEdgesAndChangesNoResult) {

@@ -112,7 +112,7 @@ TEST(Boundary, StatementsStandInBlocksOfTheirOwnInSetOrder) {
         leda::list<ZfCCfgVariable*> Variables;
         leda::list<ZfCCfgExpression*> Expressions;
         Variables.append(P.var("p"));
-        Expressions.append(P.expression("5"));
+        Expressions.append(P.expression("5 + k")); // the caller reads k, nobody else does
         P.graph().setParametersOfCall(pCall, Variables, Expressions);
     }
     Calls[0]->setIsCallToDirectlyOrIndirectlyFromOutsideCallableFcn(true);
@@ -120,7 +120,7 @@ TEST(Boundary, StatementsStandInBlocksOfTheirOwnInSetOrder) {
     auto First = [&](char const* Name) {
         return P.graph().target(P.graph().first_adj_edge(P.procedure(Name)->getEntryNode()));
     };
-    EXPECT_EQ(contents(P, First("#main")), "init o; init i; init p; ");
+    EXPECT_EQ(contents(P, First("#main")), "init o; init i; init p; init k; ");
     EXPECT_EQ(contents(P, First("f")), "param p 2; param o 2; param i 2; ");
     EXPECT_EQ(contents(P, First("unused")), "param q 0; ");
     leda::node Exit = P.procedure("#main")->getExitNode();
