@@ -226,21 +226,27 @@ TEST(Oracle, OtherProgramsDoTheSame) {
 // ---- shrinking ----
 
 TEST(Shrinker, KeepsWhatTheFailureNeeds) {
-    Trial Failing = trialOf("input uint8 i;\nproc main() {\n  if (i > 3) {\n    while (i == 1) {\n "
-                            "     i = (2 + 3) * 4;\n    }\n  } else {\n    i = 7;\n  }\n}\n");
+    Trial Failing =
+        trialOf("input uint8 i;\nproc main() {\n  if (i > 3) {\n    while (i == 1) {\n "
+                "     i = (2 + 3) * 4;\n    }\n  } else {\n    i = 7;\n  }\n  switch (i) {\n"
+                "    case 1:\n      i = 9;\n    default:\n  }\n}\n");
+    const auto Holds = [](const std::string& Text, const char* pPart) {
+        return Text.find(pPart) != std::string::npos;
+    };
     unsigned Asked = 0;
     Shrinker Smaller(
         [&](const Trial& Each) {
             ++Asked;
             const std::string& Text = Each.Text;
-            return Text.find("while") != std::string::npos &&
+            return Holds(Text, "while") && Holds(Text, "9") &&
+                   Holds(Text, "switch") == (Holds(Text, "case") && Holds(Text, "default")) &&
                    std::count(Text.begin(), Text.end(), '{') ==
                        std::count(Text.begin(), Text.end(), '}') &&
                    Each.Passes.contains(PassId::DivideBasicBlock);
         },
         2000);
     const Trial Small = Smaller.shrink(Failing);
-    EXPECT_EQ("while {\n    }\n", Small.Text);
+    EXPECT_EQ("while {\n    }\n9\n", Small.Text);
     EXPECT_EQ("placeExitNodes,transformToSSAForm,divideBasicBlock", listPasses(Small.Passes));
     EXPECT_EQ(1u, Small.Run.Steps);
     EXPECT_LT(Asked, 2000u);
