@@ -133,6 +133,15 @@ std::vector<BrokenPlace> structurePlaces() {
              return P.graph().makeProcedureAndCall(v) != nullptr && P.graph().indeg(Exit) == 2 &&
                     P.graph().indeg(w) == 1 && P.graph().outdeg(Outside) == 0;
          }},
+        {"extraction of a procedure that leads into another", "proc main { x = 1; } proc f { }", 1,
+         "pInf->getProcedure() == pOldProcedure;pInf->getProcedure() == pOldProcedure;",
+         [](Program& P) {
+             leda::node Exit = exitOf(P, "#main"), Dead = P.block();
+             P.blockOf(Dead)->setProcedure(P.procedure("#main"));
+             P.edge(Exit, behind(P, P.procedure("f")->getEntryNode()));
+             P.edge(Dead, behind(P, mainEntry(P)));
+             return P.graph().makeProcedureAndCall(behind(P, mainEntry(P))) != nullptr;
+         }},
         // Arguments of nobody, and more of them than the first call had.
         {"arguments of nobody", "proc main { call f; }", 1, "",
          [](Program& P) { return !takesArguments(P, P.calls()[0], {"a"}); }},

@@ -22,6 +22,9 @@ TEST(Propagation, ValuesOfAllDefinitions) {
         {"proc main { x = 1; call f; x = x + 1; call f; } proc f { y = x; }",
          "1 2 0 bottom|1 2 0 bottom"},
         {"proc main { x = u; }", "bottom 0|bottom 0"},
+        // What the callee gives back is known behind the condition's first visit alone.
+        {"proc main { call f; if r { x = 3; } else { x = 4; } } proc f { r = 0; }",
+         "3 4 bottom 0|4 4 0"},
         // A phi function over equal and over different constants, and over a dead branch's
         // definition.
         {"proc main { if u { x = 3; } else { x = 3; } }", "3 3 3 0|3 3 3 0"},
@@ -196,6 +199,66 @@ TEST(Propagation, AWideJoinLooksAtAllItsOperands) {
         EXPECT_EQ(pMerged->getMinValue().getValue(), Odd % 2 ? 3 : 1) << Odd;
         EXPECT_EQ(pMerged->getMaxValue().getValue(), Odd % 2 ? 7 : 3) << Odd;
     }
+}
+
+// Where operands have ranges that are unknown in different ways, the oldest of them counts, in
+// whatever order their edges come in.
+TEST(Propagation, TheRangeOfAJoinIsThatOfItsOldestUnknownOperand) {
+    for (char const* pText : {"if u { x = 3; } else { if 0 { x = 1; } else { x = u; } }",
+                              "if u { x = 3; } else { if 0 { x = u; } else { x = u; } }",
+                              "if u { x = u; } else { if 0 { x = 1; } else { x = 3; } }"})
+        for (int Order = 0; Order < 6; ++Order) {
+            Program P;
+            P.input("u");
+            leda::node Entry = P.entry("#main"), a = P.block("? u"), b = P.block("? 0"),
+                       Join = P.block("y = x;"), Arms[3];
+            std::string Text = pText;
+            for (leda::node& Arm : Arms) {
+                std::size_t At = Text.find("x =");
+                Arm = P.block(Text.substr(At, 6));
+                Text.erase(0, At + 6);
+            }
+            P.edge(Entry, a);
+            P.trueEdge(a, Arms[0]);
+            P.falseEdge(a, b);
+            P.trueEdge(b, Arms[1]);
+            P.falseEdge(b, Arms[2]);
+            int First = Order % 3, Step = 1 + Order / 3;
+            for (int i = 0; i < 3; ++i)
+                P.edge(Arms[(First + Step * i) % 3], Join);
+            P.propagate(false);
+            for (auto& Item : P.statements())
+                if (ZfCPhiFunction* pPhi = Item.second->isPhiFunction()) {
+                    if (originalOf(pPhi->getVariable()) != P.var("x"))
+                        continue;
+                    tagZfECfgValueKind Expected = eCfgValueConstant;
+                    for (ZfCCfgVariable* pVar : pPhi->getUsedVariables())
+                        if (Expected == eCfgValueConstant)
+                            Expected = pVar->getMinValue().getValueKind();
+                    EXPECT_NE(Expected, eCfgValueConstant);
+                    EXPECT_EQ(pPhi->getVariable()->getMinValue().getValueKind(), Expected)
+                        << pText << Order;
+                }
+        }
+}
+
+// Nothing tells the library when the answer of a condition without variables changes.
+TEST(Propagation, AConditionWithoutVariablesIsAskedInEachIteration) {
+    struct Changing : Expression {
+        int Asked = 0;
+        ZfCCfgValue evaluate() override {
+            return ++Asked == 1 ? ZfCCfgValue(eCfgValueUndetermined) : ZfCCfgValue(0.0);
+        }
+    };
+    Program P("proc main { c = 1; if c { x = 1; } else { x = 2; } y = x; }");
+    for (leda::node v : P.graph().all_nodes())
+        if (P.blockOf(v) != nullptr && P.blockOf(v)->getBranchCond() != nullptr) {
+            auto* pAnswer = new Changing;
+            P.pFactory->addSFExpression(pAnswer);
+            P.blockOf(v)->appendBranch(pAnswer);
+        }
+    P.propagate(true);
+    EXPECT_EQ(P.valuesOf("x"), "2 2 0");
 }
 
 TEST(Propagation, ASecondRunDoublesTheSSAEdgesAndChangesNoResult) {

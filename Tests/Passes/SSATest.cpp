@@ -43,6 +43,15 @@ TEST(Summaries, CalleesSetsReachEveryCallerThroughRings) {
     }
 }
 
+// a is done twice as early as it seems, for it calls its leaf twice; c still waits for b.
+TEST(Summaries, ACallerWaitsForItsLastCallee) {
+    Program P("proc main { call c; } proc c { call a; call b; } proc a { call leaf; call leaf; }"
+              "proc leaf { x = 1; } proc b { call b1; } proc b1 { call b2; } proc b2 { call b3; }"
+              "proc b3 { call b4; } proc b4 { z = 1; }");
+    P.toSSA();
+    EXPECT_EQ(names(P.procedure("#main")->getDefinedVariables()), "x z");
+}
+
 // The closure by definition: what is reachable in the call graph.
 TEST(Summaries, RandomCallGraphsAgreeWithTheClosure) {
     std::mt19937 Random(7);
