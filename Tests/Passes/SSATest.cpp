@@ -139,6 +139,10 @@ TEST(Boundary, StatementsStandInBlocksOfTheirOwnInSetOrder) {
             EXPECT_EQ(contents(P, Item.first), "call; return o; ");
         }
     EXPECT_EQ(P.procedure("f")->getValueReturnStatements().size(), 2);
+    for (auto& Item : P.statements()) // in the order of the calls
+        if (Item.second == P.procedure("f")->getValueReturnStatements().front()) {
+            EXPECT_EQ(P.blockOf(Item.first)->getStatementSeq().front(), Calls[0]);
+        }
     // One marked call makes all implicit arguments unknown, and leaves the explicit one alone.
     for (ZfCCfgParamStatement* pParam : P.procedure("f")->getParamStatements()) {
         bool IsExplicit = originalOf(pParam->getVariable()) == P.var("p");
