@@ -261,6 +261,16 @@ TEST(Propagation, AConditionWithoutVariablesIsAskedInEachIteration) {
     EXPECT_EQ(P.valuesOf("x"), "2 2 0");
 }
 
+// Nothing is constant here, so there is one iteration, and the caller's sweep is the first.
+TEST(Propagation, AChangeReachesItsUsersInTheSameIteration) {
+    Program P("proc main { call f; x = r; } proc f { r = u; }");
+    P.input("u");
+    for (char const* Name : {"r", "x"})
+        P.var(Name)->Init = ZfCCfgValue(eCfgValueNonConstant);
+    P.propagate(false);
+    EXPECT_EQ(P.valuesOf("x"), "bottom bottom");
+}
+
 TEST(Propagation, ASecondRunDoublesTheSSAEdgesAndChangesNoResult) {
     Program P("proc main { x = 1; if u { x = x + 1; } y = x; z = 2; }");
     P.input("u");
@@ -312,6 +322,16 @@ TEST(ConstantApplication, StatementsAndConditionsAreOfferedAndShapesStay) {
     EXPECT_EQ(Numbers(), 103);
     EXPECT_EQ(P.graph().number_of_nodes(), Nodes);
     EXPECT_EQ(P.graph().number_of_edges(), Edges);
+}
+
+TEST(ConstantApplication, ConditionsAreFoldedToo) {
+    Program P("proc main { if 1 + 1 { x = 1; } }");
+    P.propagate(false);
+    P.graph().foldConstants();
+    for (leda::node v : P.graph().all_nodes())
+        if (P.blockOf(v) && P.blockOf(v)->getBranchCond()) {
+            EXPECT_EQ(termOf(P.blockOf(v)->getBranchCond()).Op, 'k');
+        }
 }
 
 // --- Dead code ---
