@@ -47,6 +47,12 @@ int balanceOf(const std::string& Line) {
                             std::count(Line.begin(), Line.end(), '}'));
 }
 
+/// The line of a case of a switch.
+bool isCase(const std::string& Line) {
+    const std::size_t First = Line.find_first_not_of(" \t");
+    return Line.compare(First, 5, "case ") == 0 || Line.compare(First, 7, "default") == 0;
+}
+
 bool isBalanced(const std::vector<std::string>& Tokens, std::size_t First, std::size_t End) {
     int Depth = 0;
     for (std::size_t i = First; i < End; ++i) {
@@ -184,8 +190,10 @@ bool Shrinker::shrinkLines() {
             Goes = tryLines(Without) || Goes;
         }
         if (End > i && i < m_Lines.size()) {
+            // What is in the block stays; the cases of a switch do not.
             Without = m_Lines;
             Without.erase(At(End));
+            Without.erase(std::remove_if(At(i) + 1, At(End), isCase), At(End));
             Without.erase(At(i));
             Goes = tryLines(Without) || Goes;
         }

@@ -200,6 +200,10 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
         if (Range.isSingle())
             Value = ZfCCfgValue(Range.Low);
     }
+    // The hull of ends overlooks a NaN that meets numbers: what takes its range from a constant
+    // must not be given one.
+    if (Value.isConstant() && std::isnan(Value.getValue()))
+        return ZfCCfgValue(eCfgValueNonConstant);
     if (Value.isConstant()) {
         if (pBudget != nullptr && !pBudget->maySettle(this, m_pRoot->Position))
             return ZfCCfgValue(eCfgValueNonConstant);

@@ -3,6 +3,8 @@
 #include "Model/Conversion.h"
 #include "ZfCSSAVariable.h"
 
+#include <cmath>
+
 ZfCCfgSFVariable::ZfCCfgSFVariable(const hpn::Variable& Declaration)
     : m_Declaration(Declaration), m_DataType(Declaration.pType->Base),
       m_Scaling(*Declaration.pType), m_StorageRange(hpn::storageRange(*Declaration.pType)),
@@ -44,7 +46,8 @@ ZfCCfgValue ZfCCfgSFVariable::getInitValue() {
     if (isArray() || isVolatile())
         return ZfCCfgValue(eCfgValueNonConstant);
     const double Initial = m_Declaration.Initial.empty() ? 0.0 : m_Declaration.Initial.front();
-    return ZfCCfgValue(hpn::convertNumber(Initial, getType()));
+    const double Number = hpn::convertNumber(Initial, getType());
+    return std::isnan(Number) ? ZfCCfgValue(eCfgValueNonConstant) : ZfCCfgValue(Number);
 }
 
 bool ZfCCfgSFVariable::isOutput() {

@@ -79,6 +79,25 @@ TEST(Oracle, AcceptsTheSoundProgram) {
     EXPECT_EQ(1u, Result.Counts.Passes[static_cast<std::size_t>(PassId::RemoveUnusedVarDefs)]);
 }
 
+// Programs that were optimised wrongly once.
+TEST(Oracle, AcceptsWhatWasWrongOnce) {
+    for (const char* pText :
+         {"input bool in; output bool o; state float32 s;\n"
+          "proc f() { s = 1e39; s = s / s; }\n"
+          "proc main() { s = 0; if (in) { f(); f(); } o = s == 0; }\n",
+          "output bool o; state float64 s = 1e308 * 10 - 1e308 * 10; state float64 t = 1;\n"
+          "proc f() { t = s; }\n"
+          "proc main() { if (o) { f(); f(); } o = t == 1; s = t; }\n"}) {
+        for (std::uint64_t Stimulus = 1; Stimulus < 5; ++Stimulus) {
+            Trial Wanted = trialOf(pText);
+            Wanted.Run.Steps = 8;
+            Wanted.Run.StimulusSeed = Stimulus;
+            const TrialResult Result = runTrial(Wanted);
+            EXPECT_EQ("", Result.Failed.Kind) << pText << Result.Failed.Detail;
+        }
+    }
+}
+
 TEST(Oracle, SeesAChangedConstant) {
     EXPECT_EQ("outputs", kindAfter("foldConstants", [](ProgramGraph& Graph) {
                   return forEachStatement(Graph, [&](ZfCBasicBlock*, ZfCCfgStatement* pStatement) {
@@ -226,21 +245,27 @@ TEST(Oracle, OtherProgramsDoTheSame) {
 // ---- shrinking ----
 
 TEST(Shrinker, KeepsWhatTheFailureNeeds) {
-    Trial Failing = trialOf("input uint8 i;\nproc main() {\n  if (i > 3) {\n    while (i == 1) {\n "
-                            "     i = (2 + 3) * 4;\n    }\n  } else {\n    i = 7;\n  }\n}\n");
+    Trial Failing =
+        trialOf("input uint8 i;\nproc main() {\n  if (i > 3) {\n    while (i == 1) {\n "
+                "     i = (2 + 3) * 4;\n    }\n  } else {\n    i = 7;\n  }\n  switch (i) {\n"
+                "    case 1:\n      i = 9;\n    default:\n  }\n}\n");
+    const auto Holds = [](const std::string& Text, const char* pPart) {
+        return Text.find(pPart) != std::string::npos;
+    };
     unsigned Asked = 0;
     Shrinker Smaller(
         [&](const Trial& Each) {
             ++Asked;
             const std::string& Text = Each.Text;
-            return Text.find("while") != std::string::npos &&
+            return Holds(Text, "while") && Holds(Text, "9") &&
+                   Holds(Text, "switch") == (Holds(Text, "case") && Holds(Text, "default")) &&
                    std::count(Text.begin(), Text.end(), '{') ==
                        std::count(Text.begin(), Text.end(), '}') &&
                    Each.Passes.contains(PassId::DivideBasicBlock);
         },
         2000);
     const Trial Small = Smaller.shrink(Failing);
-    EXPECT_EQ("while {\n    }\n", Small.Text);
+    EXPECT_EQ("while {\n    }\n9\n", Small.Text);
     EXPECT_EQ("placeExitNodes,transformToSSAForm,divideBasicBlock", listPasses(Small.Passes));
     EXPECT_EQ(1u, Small.Run.Steps);
     EXPECT_LT(Asked, 2000u);

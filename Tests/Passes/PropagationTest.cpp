@@ -2,6 +2,7 @@
 
 #include <cmath>
 
+#include "Generators/LibraryProgram.h"
 #include "LibraryClient/TestClient.h"
 #include "Oracles/SSAVerifier.h"
 
@@ -21,6 +22,9 @@ TEST(Propagation, ValuesOfAllDefinitions) {
         {"proc main { x = 1; call f; x = x + 1; call f; } proc f { y = x; }",
          "1 2 0 bottom|1 2 0 bottom"},
         {"proc main { x = u; }", "bottom 0|bottom 0"},
+        // What the callee gives back is known behind the condition's first visit alone.
+        {"proc main { call f; if r { x = 3; } else { x = 4; } } proc f { r = 0; }",
+         "3 4 bottom 0|4 4 0"},
         // A phi function over equal and over different constants, and over a dead branch's
         // definition.
         {"proc main { if u { x = 3; } else { x = 3; } }", "3 3 3 0|3 3 3 0"},
@@ -34,7 +38,7 @@ TEST(Propagation, ValuesOfAllDefinitions) {
         {"proc main { while u { x = x * 0; } }", "0 0 0|0 0 0"},
     };
     for (auto& Row : Rows) {
-        std::string Found;
+        std::string Found, Later;
         for (bool RemoveDeadCode : {false, true}) {
             Program P(Row.Text);
             P.input("u");
@@ -43,8 +47,59 @@ TEST(Propagation, ValuesOfAllDefinitions) {
             EXPECT_TRUE(R.silent()) << Row.Text;
             EXPECT_EQ(verifySSA(P.graph()), "") << Row.Text;
             Found += (RemoveDeadCode ? "|" : "") + P.valuesOf("x");
+            // Nothing becomes constant in a second run but what waits for dead operands to go.
+            P.graph().propagateSparseConditionalConstant(true);
+            Later += (RemoveDeadCode ? "|" : "") + P.valuesOf("x");
         }
         EXPECT_EQ(Found, Row.Values) << Row.Text;
+        std::string WithRemoval = Found.substr(Found.find('|') + 1);
+        EXPECT_EQ(Later, WithRemoval + "|" + WithRemoval) << Row.Text;
+    }
+}
+
+// Value and range of all definitions as bits, and the edges that control can take.
+std::string whatIsKnown(Program& P) {
+    std::string Text;
+    for (auto& Item : P.statements())
+        for (ZfCCfgVariable* pVar : Item.second->getDefinedVariables())
+            for (ZfCCfgValue Value : {pVar->getValue(), pVar->getMinValue(), pVar->getMaxValue()}) {
+                double Number = Value.isConstant() ? Value.getValue() : 0;
+                Text += std::to_string(Value.getValueKind()) +
+                        std::string(reinterpret_cast<char const*>(&Number), sizeof Number);
+            }
+    for (leda::edge e : P.graph().all_edges())
+        if (P.graph().inf(e)->isSSAEdge() == nullptr)
+            Text += P.graph().inf(e)->isEdgeExecutable() ? '+' : '-';
+    return Text;
+}
+
+// A node none of whose operands has changed is not visited again. With edges that it has not added
+// itself, a run visits every node each time that control or a change arrives, and knows no more.
+TEST(Propagation, NodesThatAreNotVisitedAgainWouldHaveGivenTheSame) {
+    for (unsigned int Run = 0; Run < 600; ++Run) {
+        std::string Known[2];
+        for (bool VisitsAll : {false, true}) {
+            Program P(LibraryProgram(Run).text());
+            P.input("in1");
+            P.output("o1");
+            P.boolean("f");
+            P.var("s")->Limit = 3;
+            // Limits and numbers without a bound of their own: ranges move where values do not.
+            P.var("c")->Init = ZfCCfgValue(Run % 2 == 0 ? eCfgValueNonConstant : eCfgValueConstant);
+            if (Run % 3 == 0)
+                P.graph().insertValidConditionAssignments();
+            P.toSSA(Run % 4 == 0);
+            P.graph().divideBasicBlock();
+            bool RemovesDeadCode = Run % 5 < 2;
+            if (VisitsAll) {
+                P.graph().addSSAEdges();
+                P.graph().sparseConditionalConstant(RemovesDeadCode);
+            } else {
+                P.graph().propagateSparseConditionalConstant(RemovesDeadCode);
+            }
+            Known[VisitsAll] = whatIsKnown(P);
+        }
+        EXPECT_EQ(Known[0], Known[1]) << "run " << Run;
     }
 }
 
@@ -114,6 +169,108 @@ TEST(Propagation, RangesAreTheHullOfTheOperands) {
             }
 }
 
+// More operands than are sorted on the way, each of them once more by a second way, and one alone
+// that widens the range to either side.
+TEST(Propagation, AWideJoinLooksAtAllItsOperands) {
+    for (int Odd = 0; Odd < 20; ++Odd) {
+        Program P;
+        P.input("u");
+        leda::node Last = P.entry("#main"), Join = P.block("y = x;");
+        for (int i = 0; i < 20; ++i) {
+            leda::node Branch = P.block("? u"), Next = P.block(),
+                       Arm = P.block(i != Odd  ? "x = 3; ? u"
+                                     : Odd % 2 ? "x = 7; ? u"
+                                               : "x = 1; ? u");
+            P.trueEdge(Arm, Join);
+            P.falseEdge(Arm, Join);
+            P.edge(Last, Branch);
+            P.trueEdge(Branch, Arm);
+            P.falseEdge(Branch, Next);
+            Last = Next;
+        }
+        P.edge(Last, P.block());
+        P.propagate(false);
+        EXPECT_NE(P.valuesOf("x").find("bottom"), std::string::npos) << Odd;
+        ZfCCfgVariable* pMerged = nullptr;
+        for (auto& Item : P.statements())
+            if (Item.second->isPhiFunction() && P.graph().indeg(Item.first) >= 40)
+                pMerged = Item.second->isPhiFunction()->getVariable();
+        ASSERT_NE(pMerged, nullptr);
+        EXPECT_EQ(pMerged->getMinValue().getValue(), Odd % 2 ? 3 : 1) << Odd;
+        EXPECT_EQ(pMerged->getMaxValue().getValue(), Odd % 2 ? 7 : 3) << Odd;
+    }
+}
+
+// Where operands have ranges that are unknown in different ways, the oldest of them counts, in
+// whatever order their edges come in.
+TEST(Propagation, TheRangeOfAJoinIsThatOfItsOldestUnknownOperand) {
+    for (char const* pText : {"if u { x = 3; } else { if 0 { x = 1; } else { x = u; } }",
+                              "if u { x = 3; } else { if 0 { x = u; } else { x = u; } }",
+                              "if u { x = u; } else { if 0 { x = 1; } else { x = 3; } }"})
+        for (int Order = 0; Order < 6; ++Order) {
+            Program P;
+            P.input("u");
+            leda::node Entry = P.entry("#main"), a = P.block("? u"), b = P.block("? 0"),
+                       Join = P.block("y = x;"), Arms[3];
+            std::string Text = pText;
+            for (leda::node& Arm : Arms) {
+                std::size_t At = Text.find("x =");
+                Arm = P.block(Text.substr(At, 6));
+                Text.erase(0, At + 6);
+            }
+            P.edge(Entry, a);
+            P.trueEdge(a, Arms[0]);
+            P.falseEdge(a, b);
+            P.trueEdge(b, Arms[1]);
+            P.falseEdge(b, Arms[2]);
+            int First = Order % 3, Step = 1 + Order / 3;
+            for (int i = 0; i < 3; ++i)
+                P.edge(Arms[(First + Step * i) % 3], Join);
+            P.propagate(false);
+            for (auto& Item : P.statements())
+                if (ZfCPhiFunction* pPhi = Item.second->isPhiFunction()) {
+                    if (originalOf(pPhi->getVariable()) != P.var("x"))
+                        continue;
+                    tagZfECfgValueKind Expected = eCfgValueConstant;
+                    for (ZfCCfgVariable* pVar : pPhi->getUsedVariables())
+                        if (Expected == eCfgValueConstant)
+                            Expected = pVar->getMinValue().getValueKind();
+                    EXPECT_NE(Expected, eCfgValueConstant);
+                    EXPECT_EQ(pPhi->getVariable()->getMinValue().getValueKind(), Expected)
+                        << pText << Order;
+                }
+        }
+}
+
+// Nothing tells the library when the answer of a condition without variables changes.
+TEST(Propagation, AConditionWithoutVariablesIsAskedInEachIteration) {
+    struct Changing : Expression {
+        int Asked = 0;
+        ZfCCfgValue evaluate() override {
+            return ++Asked == 1 ? ZfCCfgValue(eCfgValueUndetermined) : ZfCCfgValue(0.0);
+        }
+    };
+    Program P("proc main { c = 1; if c { x = 1; } else { x = 2; } y = x; }");
+    for (leda::node v : P.graph().all_nodes())
+        if (P.blockOf(v) != nullptr && P.blockOf(v)->getBranchCond() != nullptr) {
+            auto* pAnswer = new Changing;
+            P.pFactory->addSFExpression(pAnswer);
+            P.blockOf(v)->appendBranch(pAnswer);
+        }
+    P.propagate(true);
+    EXPECT_EQ(P.valuesOf("x"), "2 2 0");
+}
+
+// Nothing is constant here, so there is one iteration, and the caller's sweep is the first.
+TEST(Propagation, AChangeReachesItsUsersInTheSameIteration) {
+    Program P("proc main { call f; x = r; } proc f { r = u; }");
+    P.input("u");
+    for (char const* Name : {"r", "x"})
+        P.var(Name)->Init = ZfCCfgValue(eCfgValueNonConstant);
+    P.propagate(false);
+    EXPECT_EQ(P.valuesOf("x"), "bottom bottom");
+}
+
 TEST(Propagation, ASecondRunDoublesTheSSAEdgesAndChangesNoResult) {
     Program P("proc main { x = 1; if u { x = x + 1; } y = x; z = 2; }");
     P.input("u");
@@ -165,6 +322,16 @@ TEST(ConstantApplication, StatementsAndConditionsAreOfferedAndShapesStay) {
     EXPECT_EQ(Numbers(), 103);
     EXPECT_EQ(P.graph().number_of_nodes(), Nodes);
     EXPECT_EQ(P.graph().number_of_edges(), Edges);
+}
+
+TEST(ConstantApplication, ConditionsAreFoldedToo) {
+    Program P("proc main { if 1 + 1 { x = 1; } }");
+    P.propagate(false);
+    P.graph().foldConstants();
+    for (leda::node v : P.graph().all_nodes())
+        if (P.blockOf(v) && P.blockOf(v)->getBranchCond()) {
+            EXPECT_EQ(termOf(P.blockOf(v)->getBranchCond()).Op, 'k');
+        }
 }
 
 // --- Dead code ---

@@ -43,6 +43,15 @@ TEST(Summaries, CalleesSetsReachEveryCallerThroughRings) {
     }
 }
 
+// a is done twice as early as it seems, for it calls its leaf twice; c still waits for b.
+TEST(Summaries, ACallerWaitsForItsLastCallee) {
+    Program P("proc main { call c; } proc c { call a; call b; } proc a { call leaf; call leaf; }"
+              "proc leaf { x = 1; } proc b { call b1; } proc b1 { call b2; } proc b2 { call b3; }"
+              "proc b3 { call b4; } proc b4 { z = 1; }");
+    P.toSSA();
+    EXPECT_EQ(names(P.procedure("#main")->getDefinedVariables()), "x z");
+}
+
 // The closure by definition: what is reachable in the call graph.
 TEST(Summaries, RandomCallGraphsAgreeWithTheClosure) {
     std::mt19937 Random(7);
@@ -112,7 +121,7 @@ TEST(Boundary, StatementsStandInBlocksOfTheirOwnInSetOrder) {
         leda::list<ZfCCfgVariable*> Variables;
         leda::list<ZfCCfgExpression*> Expressions;
         Variables.append(P.var("p"));
-        Expressions.append(P.expression("5"));
+        Expressions.append(P.expression("5 + k")); // the caller reads k, nobody else does
         P.graph().setParametersOfCall(pCall, Variables, Expressions);
     }
     Calls[0]->setIsCallToDirectlyOrIndirectlyFromOutsideCallableFcn(true);
@@ -120,7 +129,7 @@ TEST(Boundary, StatementsStandInBlocksOfTheirOwnInSetOrder) {
     auto First = [&](char const* Name) {
         return P.graph().target(P.graph().first_adj_edge(P.procedure(Name)->getEntryNode()));
     };
-    EXPECT_EQ(contents(P, First("#main")), "init o; init i; init p; ");
+    EXPECT_EQ(contents(P, First("#main")), "init o; init i; init p; init k; ");
     EXPECT_EQ(contents(P, First("f")), "param p 2; param o 2; param i 2; ");
     EXPECT_EQ(contents(P, First("unused")), "param q 0; ");
     leda::node Exit = P.procedure("#main")->getExitNode();
@@ -130,6 +139,10 @@ TEST(Boundary, StatementsStandInBlocksOfTheirOwnInSetOrder) {
             EXPECT_EQ(contents(P, Item.first), "call; return o; ");
         }
     EXPECT_EQ(P.procedure("f")->getValueReturnStatements().size(), 2);
+    for (auto& Item : P.statements()) // in the order of the calls
+        if (Item.second == P.procedure("f")->getValueReturnStatements().front()) {
+            EXPECT_EQ(P.blockOf(Item.first)->getStatementSeq().front(), Calls[0]);
+        }
     // One marked call makes all implicit arguments unknown, and leaves the explicit one alone.
     for (ZfCCfgParamStatement* pParam : P.procedure("f")->getParamStatements()) {
         bool IsExplicit = originalOf(pParam->getVariable()) == P.var("p");

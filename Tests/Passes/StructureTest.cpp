@@ -203,10 +203,24 @@ TEST(Extraction, BehindAnEntryNodeTheProcedureIsThatOfTheEntry) {
     leda::node Entry = P.entry("f"), v = P.block("x=1;"), w = P.block("x=2;");
     P.edge(Entry, v);
     P.edge(v, w);
+    P.edge(w, v); // from within: left alone
     int Nodes = P.graph().number_of_nodes();
     EXPECT_STREQ(P.graph().makeProcedureAndCall(v)->getName().cstring(), "f");
     EXPECT_EQ(P.graph().number_of_nodes(), Nodes);
+    EXPECT_EQ(P.graph().indeg(v), 2);
+    EXPECT_TRUE(P.graph().checkConsistency());
+    // Now w is entered from outside too. Its procedure takes v along, and v takes itself back.
+    P.edge(P.entry("g"), w);
+    leda::node OtherEntry = P.entry("h"), Outside = P.block();
+    P.edge(OtherEntry, Outside);
+    P.edge(Outside, w);
+    P.graph().makeProcedureAndCall(v);
+    EXPECT_TRUE(P.graph().checkConsistency());
     EXPECT_EQ(P.graph().indeg(v), 1);
+    EXPECT_EQ(P.graph().indeg(w), 1);
+    EXPECT_EQ(P.blockOf(v)->getProcedure(), P.procedure("f"));
+    EXPECT_EQ(P.blockOf(w)->getProcedure(), P.procedure("g"));
+    EXPECT_EQ(P.calls().size(), 3u); // at the ends of v, w and Outside
 }
 
 TEST(Extraction, TheFirstCallFixesTheParameters) {

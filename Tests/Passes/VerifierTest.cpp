@@ -77,6 +77,14 @@ void setReturned(Program& P, ZfCCfgVariable* pVar) {
         ->isValueReturnStatement()
         ->setExpression(read(P, pVar));
 }
+// In front of the call, at a join: there is no one way back to a call that it could belong to.
+void returnTooEarly(Program& P) {
+    auto* pReturn = new ZfCCfgValueReturnStatement(undefined(P));
+    pReturn->setExpression(read(P, undefined(P)));
+    for (auto& Item : P.statements())
+        if (Item.second == assignment(P, "first"))
+            P.blockOf(Item.first)->append(pReturn);
+}
 void readIn(Program& P, std::string const& Name, ZfCCfgVariable* pVar) {
     assignment(P, Name)->setRHS(read(P, pVar));
 }
@@ -120,6 +128,8 @@ Break const SSARules[] = {
     {"an argument has no definition", [](Program& P) { setArgument(P, undefined(P)); }},
     {"an argument is not dominated by its definition",
      [](Program& P) { setArgument(P, assignment(P, "behindCall")->getLHS()); }},
+    {"a returned value is no version", [](Program& P) { setReturned(P, P.var("x")); }},
+    {"a value is returned behind no call", [](Program& P) { returnTooEarly(P); }},
     {"a returned value has no definition", [](Program& P) { setReturned(P, undefined(P)); }},
     {"a returned value is not dominated by its definition",
      [](Program& P) { setReturned(P, assignment(P, "y")->getLHS()); }},

@@ -119,7 +119,8 @@ public:
 
     // Makes what begins at v a procedure, with a call in place of each edge that comes in from
     // outside, and answers one more call, which stands in no block; the factory owns it. Joins
-    // inside that are entered from outside become procedures too. No SSA form.
+    // inside that are entered from outside become procedures too. An edge out of an exit node is
+    // reported and stays, so that its procedures stay one component. No SSA form.
     ZfCCfgProcedureCall* makeProcedureAndCall(leda::node v);
 
     // Hands pCall its arguments and empties both lists; Expressions is as long as Variables at

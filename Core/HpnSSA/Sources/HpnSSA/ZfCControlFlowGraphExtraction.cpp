@@ -5,6 +5,10 @@
 // 2. As long as a node of the new procedure is entered from a node that the entry does not
 //    reach, that node is extracted in the same way, and the search begins again.
 //
+// No call can take the place of an edge out of an exit node, of a second entry, or of unreachable
+// code of the new procedure itself, and an exit node makes no procedure. Such edges stay, and a
+// node where nothing else is left is not extracted again: the search would find it without end.
+//
 // Step 2 naturally is a recursion, as deep as the joins are nested. Here the extractions that are
 // under way stand on a stack of their own, in the same order and with the same objects made.
 // Each search takes time linear in the graph, and there is one more than there are extractions.
@@ -16,6 +20,7 @@
 namespace {
 
 using ProcedureDictionary = leda::dictionary<WqCXString, ZfCCfgProcedure*, leda::ab_tree>;
+using NodeSet = leda::set<leda::node, leda::avl_tree>;
 
 // One extraction that is under way.
 struct Extraction {
@@ -50,9 +55,11 @@ void replaceEdgeByCall(ZfCControlFlowGraph& Graph, leda::edge e, ZfCBasicBlock* 
     pCaller->append(new ZfCCfgProcedureCall(ProcedureName));
 }
 
-// Step 4: calls in place of the edges into v from other procedures' nodes.
-void replaceInEdgesByCalls(ZfCControlFlowGraph& Graph, leda::node v, ZfCCfgProcedure* pOldProcedure,
+// Step 4: calls in place of the edges into v from other procedures' nodes. Answers whether there
+// was one.
+bool replaceInEdgesByCalls(ZfCControlFlowGraph& Graph, leda::node v, ZfCCfgProcedure* pOldProcedure,
                            ZfCCfgProcedure* pNewProcedure, WqCXString const& ProcedureName) {
+    bool IsReplaced = false;
     for (leda::edge e : Graph.in_edges(v)) {
         ZfCCfgNodeInfo* pInf = Graph.inf(Graph.source(e));
         if (pInf->isEntryNode() != nullptr || pInf->getProcedure() == pNewProcedure) {
@@ -64,7 +71,9 @@ void replaceInEdgesByCalls(ZfCControlFlowGraph& Graph, leda::node v, ZfCCfgProce
             continue;
         }
         replaceEdgeByCall(Graph, e, pCaller, pOldProcedure, ProcedureName);
+        IsReplaced = true;
     }
+    return IsReplaced;
 }
 
 // Step 5: everything that is reached from v belongs to the new procedure.
@@ -82,13 +91,15 @@ void stampReachedNodes(ZfCControlFlowGraph& Graph, leda::node v, ZfCCfgProcedure
     }
 }
 
-// Steps 1 to 5 of the extraction at v. Answers false if v has no block.
+// Steps 1 to 5 of the extraction at v. Answers false if v has no block. Settled holds the nodes
+// that have been extracted since an edge was last replaced or a procedure made.
 bool beginExtraction(ZfCControlFlowGraph& Graph, ProcedureDictionary& Procedures, leda::node v,
-                     Extraction& Begun) {
+                     Extraction& Begun, NodeSet& Settled) {
     // Step 1: the block of v.
     ZfCBasicBlock* pBasicBlock = Graph.inf(v)->isBasicBlock();
     if (pBasicBlock == nullptr) {
         reportInternalError("ZfCControlFlowGraph", __LINE__);
+        Settled.insert(v);
         return false;
     }
     ZfCCfgProcedure* pOldProcedure = pBasicBlock->getProcedure();
@@ -101,7 +112,11 @@ bool beginExtraction(ZfCControlFlowGraph& Graph, ProcedureDictionary& Procedures
     if (IsNew) {
         Graph.new_edge(Begun.EntryNode, v, ZfCCfgFactory::getInstance()->createEdgeInfo());
     }
-    replaceInEdgesByCalls(Graph, v, pOldProcedure, pNewProcedure, Begun.ProcedureName);
+    if (replaceInEdgesByCalls(Graph, v, pOldProcedure, pNewProcedure, Begun.ProcedureName) ||
+        IsNew) {
+        Settled.clear();
+    }
+    Settled.insert(v);
     stampReachedNodes(Graph, v, pOldProcedure, pNewProcedure);
     return true;
 }
@@ -117,12 +132,13 @@ bool isEnteredFromUnreached(ZfCControlFlowGraph& Graph, leda::node w,
 }
 
 // One round of step 6: the last of the nodes found that is also entered from elsewhere, or null.
-leda::node findForeignJoin(ZfCControlFlowGraph& Graph, leda::node EntryNode) {
+leda::node findForeignJoin(ZfCControlFlowGraph& Graph, leda::node EntryNode,
+                           NodeSet const& Settled) {
     leda::node_array<bool> Reached(Graph, false);
     leda::list<leda::node> NodeList = leda::DFS(Graph, EntryNode, Reached);
     while (!NodeList.empty()) {
         leda::node w = NodeList.pop_back();
-        if (isEnteredFromUnreached(Graph, w, Reached)) {
+        if (isEnteredFromUnreached(Graph, w, Reached) && !Settled.member(w)) {
             return w;
         }
     }
@@ -133,16 +149,19 @@ leda::node findForeignJoin(ZfCControlFlowGraph& Graph, leda::node EntryNode) {
 
 ZfCCfgProcedureCall* ZfCControlFlowGraph::makeProcedureAndCall(leda::node v) {
     Extraction Begun;
-    if (!beginExtraction(*this, m_Procedures, v, Begun)) {
+    NodeSet Settled;
+    if (!beginExtraction(*this, m_Procedures, v, Begun, Settled)) {
         return nullptr;
     }
     leda::stack<Extraction> Open;
     Open.push(Begun);
     for (;;) {
         // Step 6: further joins, innermost extraction first.
-        leda::node w = findForeignJoin(*this, Open.top().EntryNode);
-        if (w != nullptr && beginExtraction(*this, m_Procedures, w, Begun)) {
-            Open.push(Begun);
+        leda::node w = findForeignJoin(*this, Open.top().EntryNode, Settled);
+        if (w != nullptr) {
+            if (beginExtraction(*this, m_Procedures, w, Begun, Settled)) {
+                Open.push(Begun);
+            }
             continue;
         }
         // Step 7: a call of the finished procedure. Nobody wants the call of an inner one; it is
