@@ -3,8 +3,6 @@
 #include "Model/Conversion.h"
 #include "ZfCSSAVariable.h"
 
-#include <cmath>
-
 ZfCCfgSFVariable::ZfCCfgSFVariable(const hpn::Variable& Declaration)
     : m_Declaration(Declaration), m_DataType(Declaration.pType->Base),
       m_Scaling(*Declaration.pType), m_StorageRange(hpn::storageRange(*Declaration.pType)),
@@ -46,8 +44,7 @@ ZfCCfgValue ZfCCfgSFVariable::getInitValue() {
     if (isArray() || isVolatile())
         return ZfCCfgValue(eCfgValueNonConstant);
     const double Initial = m_Declaration.Initial.empty() ? 0.0 : m_Declaration.Initial.front();
-    const double Number = hpn::convertNumber(Initial, getType());
-    return std::isnan(Number) ? ZfCCfgValue(eCfgValueNonConstant) : ZfCCfgValue(Number);
+    return ZfCCfgValue(hpn::convertNumber(Initial, getType()));
 }
 
 bool ZfCCfgSFVariable::isOutput() {
