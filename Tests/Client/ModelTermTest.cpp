@@ -233,10 +233,10 @@ TEST_F(ModelTerm, ValuesAndEndsComeFromTheVersionsAsFarAsTheyAreKnown) {
     EXPECT_EQ(Replaced.getRoot()->Number, 13.0);
 }
 
-TEST_F(ModelTerm, ANaNIsNeverTheEndOfARange) {
+TEST_F(ModelTerm, ANaNIsNoConstantAndNeverTheEndOfARange) {
     Term* pNaN = m_Terms.makeBinary(Operator::Subtract, m_Terms.makeNumber(INFINITY),
                                     m_Terms.makeNumber(INFINITY));
-    EXPECT_TRUE(expression(pNaN).evaluate().isConstant());
+    EXPECT_TRUE(expression(pNaN).evaluate().isNonConstant());
     EXPECT_TRUE(expression(pNaN).getMinimum().isNonConstant());
     EXPECT_TRUE(expression(pNaN).getMaximum().isNonConstant());
 }
