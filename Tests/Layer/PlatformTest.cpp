@@ -1,3 +1,4 @@
+#include "LEDA/allocator.h"
 #include "WqCXString.h"
 #include "ZF_DataType.h"
 #include "ZfAssertionReport.h"
