@@ -85,7 +85,7 @@ private:
     ProgramGraph& m_Graph;
     std::unordered_set<const Variable*> m_LeftOut;
     std::vector<int> m_NumberOf; // by index of the graph's node, of the procedure in hand
-    std::deque<RawNode> m_Raw; // grows without moving
+    std::deque<RawNode> m_Raw;   // grows without moving
     std::vector<FlowItem> m_Items;
     ProcedureFlow m_Notes; // parameters and form
 };

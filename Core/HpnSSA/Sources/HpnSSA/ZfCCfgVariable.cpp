@@ -7,9 +7,8 @@
 unsigned int ZfCCfgVariable::s_GlobIndexCnt = 0;
 
 ZfCCfgVariable::ZfCCfgVariable()
-    : m_Index(s_GlobIndexCnt++), m_DebugIndex(static_cast<int>(m_Index)),
-      m_pNonVirtualAlias(this), m_IsArray(false), m_IsErasable(false), m_IsVolatile(false),
-      m_Value(eCfgValueUndetermined) {
+    : m_Index(s_GlobIndexCnt++), m_DebugIndex(static_cast<int>(m_Index)), m_pNonVirtualAlias(this),
+      m_IsArray(false), m_IsErasable(false), m_IsVolatile(false), m_Value(eCfgValueUndetermined) {
 }
 
 ZfCCfgVariable::~ZfCCfgVariable() = default;
