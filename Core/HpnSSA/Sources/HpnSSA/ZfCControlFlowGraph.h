@@ -34,6 +34,7 @@
 
 class ZfCCfgVisitor;
 class ZfCPropagationState;
+class ZfCWorkList;
 
 // The intermediate code of one whole program, and every pass over it.
 //
@@ -227,32 +228,29 @@ private:
     // --- Propagation of constants --------------------------------------------------------------
 
     void buildVarUses();
-    void initSparseConditionalConstant(leda::node StartNode, leda::list<leda::edge>& CfgEdgeList,
-                                       leda::list<leda::edge>& SSAEdgeList);
+    void initSparseConditionalConstant(leda::node StartNode, ZfCWorkList& CfgEdgeList,
+                                       ZfCWorkList& SSAEdgeList);
     void sparseConditionalConstant(bool RemoveDeadCode, ZfCPropagationState& State);
-    void serveCfgEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
-                      leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
-    void serveSSAEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
-                      leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
-    void visitIfDirty(leda::node Node, leda::list<leda::edge>& CfgEdgeList,
-                      leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
+    void serveCfgEdge(int e, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+                      bool& FoundNewConstant);
+    void serveSSAEdge(int Target, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+                      bool& FoundNewConstant);
+    void visitIfDirty(int Number, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+                      bool& FoundNewConstant);
 
     void visitPhiFunction(ZfCPhiFunction* pPhi, leda::node Node, bool& FoundNewConstant);
-    void visitInstruction(ZfCBasicBlock* pBlock, leda::node Node,
-                          leda::list<leda::edge>& CfgEdgeList, leda::list<leda::edge>& SSAEdgeList,
-                          bool& FoundNewConstant);
-    void visitAssignment(ZfCCfgAssignment* pAssignment, leda::node Node,
-                         leda::list<leda::edge>& CfgEdgeList, leda::list<leda::edge>& SSAEdgeList,
-                         bool& FoundNewConstant);
-    void visitBranchCondition(ZfCCfgExpression* pCond, leda::node Node,
-                              leda::list<leda::edge>& CfgEdgeList);
-    void appendCfgOutEdges(leda::node Node, leda::list<leda::edge>& CfgEdgeList);
+    void visitInstruction(ZfCBasicBlock* pBlock, leda::node Node, ZfCWorkList& CfgEdgeList,
+                          ZfCWorkList& SSAEdgeList, bool& FoundNewConstant);
+    void visitAssignment(ZfCCfgAssignment* pAssignment, leda::node Node, ZfCWorkList& CfgEdgeList,
+                         ZfCWorkList& SSAEdgeList, bool& FoundNewConstant);
+    void visitBranchCondition(ZfCCfgExpression* pCond, leda::node Node, ZfCWorkList& CfgEdgeList);
+    void appendCfgOutEdges(leda::node Node, ZfCWorkList& CfgEdgeList);
     void visitParamStatement(ZfCCfgParamStatement* pParamStatement, leda::node Node,
-                             leda::list<leda::edge>& CfgEdgeList,
-                             leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
+                             ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+                             bool& FoundNewConstant);
     void visitValueReturnStatement(ZfCCfgValueReturnStatement* pValueReturnStatement,
-                                   leda::node Node, leda::list<leda::edge>& CfgEdgeList,
-                                   leda::list<leda::edge>& SSAEdgeList, bool& FoundNewConstant);
+                                   leda::node Node, ZfCWorkList& CfgEdgeList,
+                                   ZfCWorkList& SSAEdgeList, bool& FoundNewConstant);
 
     // --- Further passes ------------------------------------------------------------------------
 

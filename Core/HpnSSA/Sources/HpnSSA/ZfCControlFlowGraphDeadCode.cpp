@@ -74,7 +74,7 @@ void delOperandInChain(CfgGraph& Graph, ZfCPropagationState& State, leda::node w
             return;
         }
         pPhi->delReplacement(Position);
-        State.markDirty(w);
+        State.markDirty(State.numberOf(w));
     }
 }
 
@@ -207,13 +207,14 @@ bool ZfCControlFlowGraph::eliminateDeadCode() {
     leda::list<leda::edge> EdgesToDelete;
     for (leda::node v : State.takeUnvisitedBlocks()) {
         ZfCBasicBlock* pBlock = inf(v)->isBasicBlock();
+        State.forget(v);
         // Step 1.
         EdgesToDelete.clear();
         // Step 2: dead paths into live code. The edges stay until all are found, so a second edge
         // into the same phi function is counted with the first still in place.
         for (leda::edge e = first_adj_edge(v); e != nullptr; e = adj_succ(e)) {
             leda::node w = target(e);
-            if (State.isSSAEdge(e) || !State.isVisited(w)) {
+            if (State.isSSAEdge(e) || !State.isVisited(State.numberOf(w))) {
                 continue;
             }
             ZfCPhiFunction* pPhi = phiFunctionAt(*this, w);
@@ -223,7 +224,7 @@ bool ZfCControlFlowGraph::eliminateDeadCode() {
             // Steps 2a, 2b and 2c.
             int Position = operandPosition(*this, e);
             pPhi->delReplacement(Position);
-            State.markDirty(w);
+            State.markDirty(State.numberOf(w));
             HasLostOperand = true;
             EdgesToDelete.append(e);
             delOperandInChain(*this, State, w, Position);
@@ -241,7 +242,6 @@ bool ZfCControlFlowGraph::eliminateDeadCode() {
             pBlock->del(pStmt);
         }
         // Step 5.
-        State.forget(v);
         ZfCCfgFactory::getInstance()->delBasicBlock(pBlock);
         del_node(v);
     }

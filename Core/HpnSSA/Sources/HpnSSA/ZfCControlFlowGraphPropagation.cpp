@@ -17,11 +17,12 @@
 // keeps a value from being called constant too early.
 //
 // Departures, in cost alone. Flags and marks of the run are kept in flat tables and written to the
-// records at its end. Whether a block has an executable in-edge is read from its visited mark:
-// whoever sets the flag of an edge into a block marks the block, so the mark says the same as a
-// count over the in-edges and does not take the square of them at a wide join. A node none of whose
-// operands has changed since its last visit is not evaluated again, for that would give what is
-// there already; see ZfCPropagationState.h.
+// records at its end, and the work lists hold the numbers by which the tables go: of control flow
+// edges, and of the nodes at the ends of SSA edges. Whether a block has an executable in-edge is
+// read from its visited mark: whoever sets the flag of an edge into a block marks the block, so the
+// mark says the same as a count over the in-edges and does not take the square of them at a wide
+// join. A node none of whose operands has changed since its last visit is not evaluated again, for
+// that would give what is there already; see ZfCPropagationState.h.
 //
 // An iteration is linear in the edges of both kinds and in how often a value changes, which is at
 // most a few times for each variable.
@@ -32,8 +33,11 @@
 #include "ZfCPropagationState.h"
 
 void ZfCControlFlowGraph::propagateSparseConditionalConstant(bool RemoveDeadCode) {
-    addSSAEdges();
+    // The tables are made first: the addition of SSA edges has their ends at hand.
     ZfCPropagationState State(*this, true);
+    m_pPropagation = &State;
+    addSSAEdges();
+    State.endOfUsers();
     sparseConditionalConstant(RemoveDeadCode, State);
 }
 
@@ -69,26 +73,28 @@ void ZfCControlFlowGraph::addSSAEdges() {
             leda::set<leda::node, leda::avl_tree> UsingNodes = pVariable->getUses();
             for (leda::node UsingNode : UsingNodes) {
                 new_edge(DefiningNode, UsingNode, pFactory->createSSAEdge());
+                if (m_pPropagation != nullptr) {
+                    m_pPropagation->addUser(DefiningNode, UsingNode);
+                }
             }
         }
     }
 }
 
 void ZfCControlFlowGraph::initSparseConditionalConstant(leda::node StartNode,
-                                                        leda::list<leda::edge>& CfgEdgeList,
-                                                        leda::list<leda::edge>& SSAEdgeList) {
+                                                        ZfCWorkList& CfgEdgeList,
+                                                        ZfCWorkList& SSAEdgeList) {
     // Step 1.
     CfgEdgeList.clear();
     SSAEdgeList.clear();
     // Step 2: nothing but control flow leaves an entry node.
     for (leda::edge e = first_adj_edge(StartNode); e != nullptr; e = adj_succ(e)) {
-        CfgEdgeList.append(e);
+        CfgEdgeList.append(m_pPropagation->numberOf(e));
     }
 }
 
 // Step 3c: a phi function is visited over each edge, anything else on first arrival.
-void ZfCControlFlowGraph::serveCfgEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
-                                       leda::list<leda::edge>& SSAEdgeList,
+void ZfCControlFlowGraph::serveCfgEdge(int e, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
                                        bool& FoundNewConstant) {
     ZfCPropagationState& State = *m_pPropagation;
     if (State.isExecutable(e)) {
@@ -96,7 +102,7 @@ void ZfCControlFlowGraph::serveCfgEdge(leda::edge e, leda::list<leda::edge>& Cfg
     }
     // Step 3c1.
     State.setExecutable(e);
-    leda::node Target = target(e);
+    const int Target = State.targetOf(e);
     // Step 3c2.
     if (State.isBasicBlock(Target)) {
         bool IsFirstArrival = State.arriveAt(Target);
@@ -105,35 +111,31 @@ void ZfCControlFlowGraph::serveCfgEdge(leda::edge e, leda::list<leda::edge>& Cfg
         }
     }
     // Step 3c3: without a branch, control goes on.
-    if (leda::edge f = State.onlyCfgOutEdge(Target)) {
-        CfgEdgeList.append(f);
-    }
+    State.appendOnlyCfgOutEdge(Target, CfgEdgeList);
 }
 
-// Step 3d.
-void ZfCControlFlowGraph::serveSSAEdge(leda::edge e, leda::list<leda::edge>& CfgEdgeList,
-                                       leda::list<leda::edge>& SSAEdgeList,
-                                       bool& FoundNewConstant) {
-    leda::node Target = target(e);
+// Step 3d, for the SSA edge's end.
+void ZfCControlFlowGraph::serveSSAEdge(int Target, ZfCWorkList& CfgEdgeList,
+                                       ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
     // A change waits until control reaches the use.
     if (m_pPropagation->isVisited(Target) || m_pPropagation->isPhiFunction(Target)) {
         visitIfDirty(Target, CfgEdgeList, SSAEdgeList, FoundNewConstant);
     }
 }
 
-void ZfCControlFlowGraph::visitIfDirty(leda::node Node, leda::list<leda::edge>& CfgEdgeList,
-                                       leda::list<leda::edge>& SSAEdgeList,
-                                       bool& FoundNewConstant) {
+void ZfCControlFlowGraph::visitIfDirty(int Number, ZfCWorkList& CfgEdgeList,
+                                       ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
     ZfCPropagationState& State = *m_pPropagation;
-    if (!State.takeDirty(Node)) {
-        State.takeAgain(Node, CfgEdgeList);
+    if (!State.takeDirty(Number)) {
+        State.takeAgain(Number, CfgEdgeList);
         return;
     }
+    leda::node Node = State.nodeOf(Number);
     ZfCBasicBlock* pBlock = inf(Node)->isBasicBlock();
     if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
         visitPhiFunction(pPhi, Node, FoundNewConstant);
     } else {
-        ZF_ASSERT(State.isVisited(Node)); // so one of its in-edges is executable
+        ZF_ASSERT(State.isVisited(Number)); // so one of its in-edges is executable
         visitInstruction(pBlock, Node, CfgEdgeList, SSAEdgeList, FoundNewConstant);
     }
 }
@@ -146,8 +148,8 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode,
     for (auto Item = m_Procedures.first_item(); Item; Item = m_Procedures.next_item(Item)) {
         StartNodeList.append(m_Procedures.inf(Item)->getEntryNode());
     }
-    leda::list<leda::edge> CfgEdgeList;
-    leda::list<leda::edge> SSAEdgeList;
+    ZfCWorkList CfgEdgeList;
+    ZfCWorkList SSAEdgeList;
     bool FoundNewConstant = false;
     bool HasLostOperand = false;
     do {

@@ -2,18 +2,86 @@
 
 #include "ZfCBasicBlock.h"
 
+#include <algorithm>
+
+void ZfCWorkList::grow() {
+    const int OldSize = m_Ring.size();
+    leda::array<int> Ring(std::max(2 * OldSize, 64));
+    for (int i = 0; i < m_Size; ++i) {
+        Ring[i] = m_Ring[(m_First + i) & (OldSize - 1)];
+    }
+    m_Ring.swap(Ring);
+    m_First = 0;
+}
+
 ZfCPropagationState::ZfCPropagationState(Graph& Of, bool SSAEdgesAreComplete)
     : m_Graph(Of), m_SkipsCleanNodes(SSAEdgesAreComplete), m_Nodes(Of.max_node_index() + 1),
-      m_Blocks(Of.number_of_nodes()), m_Edges(Of.max_edge_index() + 1) {
+      m_Handles(Of.max_node_index() + 1), m_Edges(Of.max_edge_index() + 1),
+      m_Records(Of.max_edge_index() + 1) {
     for (leda::node v = Of.first_node(); v != Of.stop_node(); v = Of.next_node(v)) {
-        if (Of.inf(v)->isBasicBlock() != nullptr) {
-            const int Index = m_Graph.index(v);
-            m_Nodes[Index].IsBlock = true;
-            m_Blocks[m_NumberOfBlocks++] = {v, Index};
+        const int Number = m_Graph.index(v);
+        Node& Known = m_Nodes[Number];
+        m_Handles[Number] = v;
+        if (ZfCBasicBlock* pBlock = Of.inf(v)->isBasicBlock()) {
+            Known.IsBlock = true;
+            Known.IsPhi = pBlock->isPhiFunction() != nullptr;
+            ++m_NumberOfBlocks;
         }
+        for (leda::edge e = Of.first_adj_edge(v); e != nullptr; e = Of.adj_succ(e)) {
+            Edge& KnownEdge = m_Edges[m_Graph.index(e)];
+            KnownEdge.Target = static_cast<unsigned int>(m_Graph.index(Of.target(e)));
+            if (Of.inf(e)->isSSAEdge() != nullptr) {
+                KnownEdge.IsSSA = 1;
+                m_HadSSAEdges = true;
+            } else {
+                m_Records[m_Graph.index(e)] = Of.inf(e);
+            }
+        }
+        describe(Number);
     }
-    for (leda::edge e = Of.first_edge(); e != Of.stop_edge(); e = Of.next_edge(e)) {
-        m_Edges[m_Graph.index(e)] = Of.inf(e)->isSSAEdge() != nullptr ? IsSSA : 0;
+    if (m_HadSSAEdges) {
+        collectUsers();
+    }
+}
+
+void ZfCPropagationState::appendUser(int Definition, int Target) {
+    Node& Known = m_Nodes[Definition];
+    if (Known.FirstUser == s_None) {
+        Known.FirstUser = m_NumberOfUsers;
+    } else {
+        m_Users[m_NumberOfUsers - 1].IsLast = 0;
+    }
+    if (m_NumberOfUsers == m_Users.size()) {
+        m_Users.resize(std::max(2 * m_NumberOfUsers, m_Nodes.size()));
+    }
+    m_Users[m_NumberOfUsers].Target = static_cast<unsigned int>(Target);
+    m_Users[m_NumberOfUsers].IsLast = 1;
+    ++m_NumberOfUsers;
+}
+
+// With earlier SSA edges those of one definition do not come in a row; endOfUsers collects them.
+void ZfCPropagationState::addUser(leda::node Definition, leda::node User) {
+    if (!m_HadSSAEdges) {
+        appendUser(m_Graph.index(Definition), m_Graph.index(User));
+    }
+}
+
+void ZfCPropagationState::endOfUsers() {
+    if (m_HadSSAEdges) {
+        collectUsers();
+    }
+}
+
+void ZfCPropagationState::collectUsers() {
+    m_NumberOfUsers = 0;
+    for (leda::node v = m_Graph.first_node(); v != m_Graph.stop_node(); v = m_Graph.next_node(v)) {
+        const int Number = m_Graph.index(v);
+        m_Nodes[Number].FirstUser = s_None;
+        for (leda::edge e = m_Graph.first_adj_edge(v); e != nullptr; e = m_Graph.adj_succ(e)) {
+            if (isSSAEdge(e)) {
+                appendUser(Number, m_Graph.index(m_Graph.target(e)));
+            }
+        }
     }
 }
 
@@ -22,27 +90,25 @@ void ZfCPropagationState::beginIteration() {
         m_Nodes[i].IsVisited = false;
     }
     for (int i = 0; i < m_Edges.size(); ++i) {
-        m_Edges[i] &= IsSSA;
+        m_Edges[i].IsExecutable = 0;
     }
     m_VisitedBlocks = 0;
 }
 
 leda::list<leda::node> ZfCPropagationState::takeUnvisitedBlocks() {
     leda::list<leda::node> Unvisited;
-    int Kept = 0;
-    for (int i = 0; i < m_NumberOfBlocks; ++i) {
-        if (m_Nodes[m_Blocks[i].Index].IsVisited) {
-            m_Blocks[Kept++] = m_Blocks[i];
-        } else {
-            Unvisited.append(m_Blocks[i].Node);
+    for (int i = 0; i < m_Nodes.size(); ++i) {
+        if (m_Nodes[i].IsBlock && !m_Nodes[i].IsVisited) {
+            Unvisited.append(m_Handles[i]);
+            m_Nodes[i].IsBlock = false;
+            --m_NumberOfBlocks;
         }
     }
-    m_NumberOfBlocks = Kept;
     return Unvisited;
 }
 
-bool ZfCPropagationState::arriveAt(leda::node v) {
-    Node& Known = m_Nodes[m_Graph.index(v)];
+bool ZfCPropagationState::arriveAt(int v) {
+    Node& Known = m_Nodes[v];
     if (Known.IsVisited) {
         return false;
     }
@@ -51,27 +117,38 @@ bool ZfCPropagationState::arriveAt(leda::node v) {
     return true;
 }
 
-bool ZfCPropagationState::takeDirty(leda::node v) {
-    Node& Known = m_Nodes[m_Graph.index(v)];
+bool ZfCPropagationState::takeDirty(int v) {
+    Node& Known = m_Nodes[v];
     const bool IsDirty = Known.IsDirty || !m_SkipsCleanNodes;
     Known.IsDirty = false;
     return IsDirty;
 }
 
 void ZfCPropagationState::markParametersDirty() {
-    for (leda::node v = m_Graph.first_node(); v != m_Graph.stop_node(); v = m_Graph.next_node(v)) {
-        ZfCBasicBlock* pBlock = m_Graph.inf(v)->isBasicBlock();
-        ZfCCfgStatement* pStmt = pBlock != nullptr ? pBlock->isStatement() : nullptr;
+    for (int i = 0; i < m_Nodes.size(); ++i) {
+        if (!m_Nodes[i].IsBlock) {
+            continue;
+        }
+        ZfCCfgStatement* pStmt = m_Graph.inf(m_Handles[i])->isBasicBlock()->isStatement();
         if (pStmt != nullptr && pStmt->isParamStatement() != nullptr) {
-            markDirty(v);
+            markDirty(i);
         }
     }
 }
 
-void ZfCPropagationState::take(leda::node v, int Position, leda::edge e,
-                               leda::list<leda::edge>& CfgEdgeList) {
-    CfgEdgeList.append(e);
-    Node& Known = m_Nodes[m_Graph.index(v)];
+void ZfCPropagationState::appendOnlyCfgOutEdge(int v, ZfCWorkList& CfgEdgeList) {
+    Node const& Known = m_Nodes[v];
+    if (!Known.IsDescribed) {
+        describe(v);
+    }
+    if (Known.OutCount == 1) {
+        CfgEdgeList.append(Known.Out[0]);
+    }
+}
+
+void ZfCPropagationState::take(int v, int Position, leda::edge e, ZfCWorkList& CfgEdgeList) {
+    CfgEdgeList.append(m_Graph.index(e));
+    Node& Known = m_Nodes[v];
     if (Position < s_MostRemembered) {
         Known.Taken = static_cast<unsigned char>(Known.Taken | (1U << Position));
     } else {
@@ -79,33 +156,43 @@ void ZfCPropagationState::take(leda::node v, int Position, leda::edge e,
     }
 }
 
-void ZfCPropagationState::takeAgain(leda::node v, leda::list<leda::edge>& CfgEdgeList) {
-    unsigned int Taken = m_Nodes[m_Graph.index(v)].Taken;
-    for (leda::edge e = m_Graph.first_adj_edge(v); Taken != 0; e = m_Graph.adj_succ(e)) {
-        if (isSSAEdge(e)) {
-            continue;
-        }
-        if ((Taken & 1U) != 0) {
-            CfgEdgeList.append(e);
-        }
-        Taken >>= 1U;
+void ZfCPropagationState::takeAgain(int v, ZfCWorkList& CfgEdgeList) {
+    Node const& Known = m_Nodes[v];
+    if (Known.Taken == 0) {
+        return;
     }
-}
-
-void ZfCPropagationState::markUsersDirty(leda::node v) {
-    for (leda::edge e = m_Graph.first_adj_edge(v); e != nullptr; e = m_Graph.adj_succ(e)) {
-        if (isSSAEdge(e)) {
-            markDirty(m_Graph.target(e));
+    if (!Known.IsDescribed) {
+        describe(v);
+    }
+    for (int i = 0; i < s_MostRemembered; ++i) {
+        if ((Known.Taken & (1U << i)) != 0) {
+            CfgEdgeList.append(Known.Out[i]);
         }
     }
 }
 
-void ZfCPropagationState::appendSSAOutEdges(leda::node v, leda::list<leda::edge>& SSAEdgeList) {
-    for (leda::edge e = m_Graph.first_adj_edge(v); e != nullptr; e = m_Graph.adj_succ(e)) {
-        if (isSSAEdge(e)) {
-            SSAEdgeList.append(e);
-        }
+template <class Action>
+void ZfCPropagationState::forEachUser(int v, Action Do) {
+    int i = m_Nodes[v].FirstUser;
+    if (i == s_None) {
+        return;
     }
+    User Present;
+    do {
+        Present = m_Users[i++];
+        const int Target = static_cast<int>(Present.Target);
+        if (!m_Nodes[Target].IsGone) {
+            Do(Target);
+        }
+    } while (Present.IsLast == 0);
+}
+
+void ZfCPropagationState::markUsersDirty(int v) {
+    forEachUser(v, [this](int Target) { markDirty(Target); });
+}
+
+void ZfCPropagationState::appendUsers(int v, ZfCWorkList& SSAEdgeList) {
+    forEachUser(v, [&SSAEdgeList](int Target) { SSAEdgeList.append(Target); });
 }
 
 bool ZfCPropagationState::hasSSAInEdge(leda::node v) const {
@@ -123,33 +210,44 @@ void ZfCPropagationState::forget(leda::node v) {
             Node& Before = m_Nodes[m_Graph.index(m_Graph.source(e))];
             Before.IsDescribed = false;
             Before.IsDirty = true;
+            m_Records[m_Graph.index(e)] = nullptr;
         }
     }
-}
-
-void ZfCPropagationState::finish() {
-    for (leda::edge e = m_Graph.first_edge(); e != m_Graph.stop_edge(); e = m_Graph.next_edge(e)) {
-        if (isExecutable(e)) {
-            m_Graph.inf(e)->activateEdgeExecutable();
-        } else {
-            m_Graph.inf(e)->deactivateEdgeExecutable();
-        }
-    }
-}
-
-void ZfCPropagationState::describe(leda::node v, Node& Known) {
-    ZfCBasicBlock* pBlock = m_Graph.inf(v)->isBasicBlock();
-    Known.IsPhi = pBlock != nullptr && pBlock->isPhiFunction() != nullptr;
-    Known.pOnlyOut = nullptr;
-    Known.IsDescribed = true;
     for (leda::edge e = m_Graph.first_adj_edge(v); e != nullptr; e = m_Graph.adj_succ(e)) {
+        if (!isSSAEdge(e)) {
+            m_Records[m_Graph.index(e)] = nullptr;
+        }
+    }
+    m_Nodes[m_Graph.index(v)].IsGone = true;
+}
+
+// The flag of an SSA edge is never set.
+void ZfCPropagationState::finish() {
+    for (int i = 0; i < m_Records.size(); ++i) {
+        if (m_Records[i] == nullptr) {
+            continue;
+        }
+        if (isExecutable(i)) {
+            m_Records[i]->activateEdgeExecutable();
+        } else {
+            m_Records[i]->deactivateEdgeExecutable();
+        }
+    }
+}
+
+void ZfCPropagationState::describe(int v) {
+    Node& Known = m_Nodes[v];
+    Known.OutCount = 0;
+    Known.IsDescribed = true;
+    leda::node const Handle = m_Handles[v];
+    for (leda::edge e = m_Graph.first_adj_edge(Handle); e != nullptr; e = m_Graph.adj_succ(e)) {
         if (isSSAEdge(e)) {
             continue;
         }
-        if (Known.pOnlyOut != nullptr) {
-            Known.pOnlyOut = nullptr;
+        if (Known.OutCount == s_MostRemembered) {
+            ++Known.OutCount;
             return;
         }
-        Known.pOnlyOut = e;
+        Known.Out[Known.OutCount++] = m_Graph.index(e);
     }
 }
