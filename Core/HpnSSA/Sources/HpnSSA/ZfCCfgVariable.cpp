@@ -7,8 +7,9 @@
 unsigned int ZfCCfgVariable::s_GlobIndexCnt = 0;
 
 ZfCCfgVariable::ZfCCfgVariable()
-    : m_Index(s_GlobIndexCnt++), m_DebugIndex(static_cast<int>(m_Index)), m_pNonVirtualAlias(this),
-      m_IsArray(false), m_IsErasable(false), m_IsVolatile(false), m_Value(eCfgValueUndetermined) {
+    : m_Index(s_GlobIndexCnt++), m_DebugIndex(static_cast<int>(m_Index)),
+      m_Value(eCfgValueUndetermined), m_IsArray(false), m_IsErasable(false), m_IsVolatile(false),
+      m_pNonVirtualAlias(this) {
 }
 
 ZfCCfgVariable::~ZfCCfgVariable() = default;
@@ -61,9 +62,8 @@ void ZfCCfgVariable::initData() {
 
 void ZfCCfgVariable::resetData() {
     m_Index = 0;
-    m_SSAReplacements.clear();
     m_Uses.clear();
-    m_VirtualAliases.clear();
+    m_Rare.resize(0);
     m_IsArray = false;
     m_IsErasable = false;
     m_IsVolatile = false;
@@ -78,15 +78,19 @@ int ZfCCfgVariable::delUse(leda::node v) {
 
 leda::set<leda::node, leda::avl_tree> ZfCCfgVariable::getAllUses() {
     leda::set<leda::node, leda::avl_tree> AllUses = m_Uses;
-    for (ZfCCfgVariable* pAlias : m_VirtualAliases)
-        AllUses.add(pAlias->m_Uses);
+    if (hasRare()) {
+        for (ZfCCfgVariable* pAlias : rare().m_VirtualAliases)
+            AllUses.add(pAlias->m_Uses);
+    }
     return AllUses;
 }
 
 int ZfCCfgVariable::countAllUses() {
     int Count = countUses();
-    for (ZfCCfgVariable* pAlias : m_VirtualAliases)
-        Count += pAlias->countUses();
+    if (hasRare()) {
+        for (ZfCCfgVariable* pAlias : rare().m_VirtualAliases)
+            Count += pAlias->countUses();
+    }
     return Count;
 }
 

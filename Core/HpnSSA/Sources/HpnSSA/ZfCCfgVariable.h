@@ -2,6 +2,7 @@
 #define ZFCCFGVARIABLE_H
 
 #include "HpnSSAExport.h"
+#include "LEDA/array.h"
 #include "LEDA/graph.h"
 #include "LEDA/set.h"
 #include "LEDA/slist.h"
@@ -99,10 +100,11 @@ public:
     ZfCCfgValue const& getValue() { return m_Value; }
 
     // The stack of renaming. pop gives the popped version; top gives null when the stack is empty.
-    void pushSSAReplacement(ZfCCfgVariable* pVariable) { m_SSAReplacements.push(pVariable); }
-    ZfCCfgVariable* popSSAReplacement() { return m_SSAReplacements.pop(); }
+    void pushSSAReplacement(ZfCCfgVariable* pVariable) { rare().m_SSAReplacements.push(pVariable); }
+    ZfCCfgVariable* popSSAReplacement() { return rare().m_SSAReplacements.pop(); }
     ZfCCfgVariable* topSSAReplacement() {
-        return m_SSAReplacements.empty() ? nullptr : m_SSAReplacements.top();
+        return hasRare() && !rare().m_SSAReplacements.empty() ? rare().m_SSAReplacements.top()
+                                                              : nullptr;
     }
 
     // The nodes that use this variable; valid until the graph is edited.
@@ -135,7 +137,9 @@ public:
     // parked.
     ZfCCfgVariable* getNonVirtualAlias() { return m_pNonVirtualAlias; }
     void setNonVirtualAlias(ZfCCfgVariable* pVariable) { m_pNonVirtualAlias = pVariable; }
-    void appendVirtualAlias(ZfCCfgVariable* pVariable) { m_VirtualAliases.insert(pVariable); }
+    void appendVirtualAlias(ZfCCfgVariable* pVariable) {
+        rare().m_VirtualAliases.insert(pVariable);
+    }
 
     // Clips the number at the saturated limits; true if it was clipped. The kind is not looked at.
     bool ConsiderSaturation(ZfCCfgValue& Value);
@@ -150,17 +154,39 @@ protected:
     void adjustConstant(ZfCCfgValue& Value);
 
 private:
+    friend class ZfCSSAVariable;
+
+    // What hardly any variable has. There are many versions, and renaming puts its stack on
+    // originals only; few versions have an alias.
+    struct Rare {
+        leda::stack<ZfCCfgVariable*> m_SSAReplacements; // balanced by renaming; else empty
+        leda::set<ZfCCfgVariable*, leda::avl_tree> m_VirtualAliases;
+    };
+
+    bool hasRare() const { return m_Rare.size() != 0; }
+    Rare& rare() {
+        if (!hasRare())
+            m_Rare.resize(1);
+        return m_Rare[0];
+    }
+
+    // What the propagation asks of an operand fills one cache line, the first: the value, and of a
+    // version its original and its range, numbers and kinds. Only ZfCSSAVariable uses the latter.
     unsigned int m_Index;
-    int m_DebugIndex;                               // written by the constructor alone
-    leda::stack<ZfCCfgVariable*> m_SSAReplacements; // balanced by renaming; else empty
-    leda::set<ZfCCfgVariable*, leda::avl_tree> m_VirtualAliases;
-    leda::set<leda::node, leda::avl_tree> m_Uses; // stale after any graph edit
-    ZfCCfgVariable* m_pNonVirtualAlias;           // this, unless a virtual alias
-    // The value stands last, beside the range of a version: the propagation reads them together.
+    int m_DebugIndex; // written by the constructor alone
+    ZfCCfgValue m_Value;
+    ZfCCfgVariable* m_pOrigVar = nullptr; // not owned
+    double m_MinValue = 0.0;
+    double m_MaxValue = 0.0;
+    unsigned char m_MinKind = eCfgValueConstant;
+    unsigned char m_MaxKind = eCfgValueConstant;
     bool m_IsArray;
     bool m_IsErasable;
     bool m_IsVolatile;
-    ZfCCfgValue m_Value;
+
+    leda::set<leda::node, leda::avl_tree> m_Uses; // stale after any graph edit
+    ZfCCfgVariable* m_pNonVirtualAlias;           // this, unless a virtual alias
+    leda::array<Rare> m_Rare;                     // one, or none so far
 
     static unsigned int s_GlobIndexCnt;
 };

@@ -1,6 +1,16 @@
 #include "ZfCSSAVariable.h"
 
-ZfCSSAVariable::ZfCSSAVariable(ZfCCfgVariable* pVar) : m_MinValue(0.0), m_MaxValue(0.0) {
+namespace {
+
+ZfCCfgValue valueOf(double Number, unsigned char Kind) {
+    ZfCCfgValue Value(Number);
+    Value.setValueKind(static_cast<tagZfECfgValueKind>(Kind));
+    return Value;
+}
+
+} // namespace
+
+ZfCSSAVariable::ZfCSSAVariable(ZfCCfgVariable* pVar) {
     bindTo(pVar);
 }
 
@@ -14,8 +24,8 @@ void ZfCSSAVariable::initData(ZfCCfgVariable* pVar) {
 // The numbers of the range mean nothing while parked.
 void ZfCSSAVariable::resetData() {
     ZfCCfgVariable::resetData();
-    m_MaxValue = ZfCCfgValue();
-    m_MinValue = ZfCCfgValue();
+    setMax(ZfCCfgValue());
+    setMin(ZfCCfgValue());
     m_pOrigVar = nullptr;
 }
 
@@ -29,8 +39,8 @@ void ZfCSSAVariable::bindTo(ZfCCfgVariable* pVar) {
         markAsErasable();
     if (pVar->isVolatile())
         markAsVolatile();
-    m_MinValue.setValueKind(eCfgValueUndetermined);
-    m_MaxValue.setValueKind(eCfgValueUndetermined);
+    m_MinKind = eCfgValueUndetermined;
+    m_MaxKind = eCfgValueUndetermined;
 }
 
 void ZfCSSAVariable::setOrigVar(ZfCCfgVariable* pVar) {
@@ -40,31 +50,44 @@ void ZfCSSAVariable::setOrigVar(ZfCCfgVariable* pVar) {
 
 void ZfCSSAVariable::setMinValueAndDestroyOld(ZfCCfgValue const& Value) {
     if (isArray() || isVolatile()) {
-        m_MinValue = ZfCCfgValue(eCfgValueNonConstant);
+        setMin(ZfCCfgValue(eCfgValueNonConstant));
         return;
     }
-    m_MinValue = Value;
-    if (m_MinValue.isConstant())
-        adjustConstant(m_MinValue);
+    setMin(asStored(Value));
 }
 
 // Unlike the minimum, the maximum keeps its number when it becomes non-constant.
 void ZfCSSAVariable::setMaxValueAndDestroyOld(ZfCCfgValue const& Value) {
     if (isArray() || isVolatile()) {
-        m_MaxValue.setValueKind(eCfgValueNonConstant);
+        m_MaxKind = eCfgValueNonConstant;
         return;
     }
-    m_MaxValue = Value;
-    if (m_MaxValue.isConstant())
-        adjustConstant(m_MaxValue);
+    setMax(asStored(Value));
 }
 
 ZfCCfgValue ZfCSSAVariable::getMinValue() {
-    return m_MinValue;
+    return valueOf(m_MinValue, m_MinKind);
 }
 
 ZfCCfgValue ZfCSSAVariable::getMaxValue() {
-    return m_MaxValue;
+    return valueOf(m_MaxValue, m_MaxKind);
+}
+
+// An end of the range as this variable would hold it.
+ZfCCfgValue ZfCSSAVariable::asStored(ZfCCfgValue Value) {
+    if (Value.isConstant())
+        adjustConstant(Value);
+    return Value;
+}
+
+void ZfCSSAVariable::setMin(ZfCCfgValue const& Value) {
+    m_MinValue = Value.getValue();
+    m_MinKind = static_cast<unsigned char>(Value.getValueKind());
+}
+
+void ZfCSSAVariable::setMax(ZfCCfgValue const& Value) {
+    m_MaxValue = Value.getValue();
+    m_MaxKind = static_cast<unsigned char>(Value.getValueKind());
 }
 
 ZF_DataType* ZfCSSAVariable::getDataType() {

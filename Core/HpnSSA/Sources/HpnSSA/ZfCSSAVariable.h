@@ -55,10 +55,11 @@ protected:
 
 private:
     void bindTo(ZfCCfgVariable* pVar);
+    ZfCCfgValue asStored(ZfCCfgValue Value);
+    void setMin(ZfCCfgValue const& Value);
+    void setMax(ZfCCfgValue const& Value);
 
-    ZfCCfgVariable* m_pOrigVar; // not owned
-    ZfCCfgValue m_MinValue;
-    ZfCCfgValue m_MaxValue;
+    // Original and range stand in the base, beside the value: see there.
 };
 
 #endif
