@@ -235,22 +235,22 @@ private:
                       bool& FoundNewConstant);
     void serveSSAEdge(int Target, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
                       bool& FoundNewConstant);
-    void visitIfDirty(int Number, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+    void visitIfDirty(int Node, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
                       bool& FoundNewConstant);
 
-    void visitPhiFunction(ZfCPhiFunction* pPhi, leda::node Node, bool& FoundNewConstant);
-    void visitInstruction(ZfCBasicBlock* pBlock, leda::node Node, ZfCWorkList& CfgEdgeList,
+    void visitPhiFunction(ZfCPhiFunction* pPhi, int Node, bool& FoundNewConstant);
+    void visitInstruction(ZfCBasicBlock* pBlock, int Node, ZfCWorkList& CfgEdgeList,
                           ZfCWorkList& SSAEdgeList, bool& FoundNewConstant);
-    void visitAssignment(ZfCCfgAssignment* pAssignment, leda::node Node, ZfCWorkList& CfgEdgeList,
+    void visitAssignment(ZfCCfgAssignment* pAssignment, int Node, ZfCWorkList& CfgEdgeList,
                          ZfCWorkList& SSAEdgeList, bool& FoundNewConstant);
-    void visitBranchCondition(ZfCCfgExpression* pCond, leda::node Node, ZfCWorkList& CfgEdgeList);
-    void appendCfgOutEdges(leda::node Node, ZfCWorkList& CfgEdgeList);
-    void visitParamStatement(ZfCCfgParamStatement* pParamStatement, leda::node Node,
+    void visitBranchCondition(ZfCCfgExpression* pCond, int Node, ZfCWorkList& CfgEdgeList);
+    void appendCfgOutEdges(int Node, ZfCWorkList& CfgEdgeList);
+    void visitParamStatement(ZfCCfgParamStatement* pParamStatement, int Node,
                              ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
                              bool& FoundNewConstant);
-    void visitValueReturnStatement(ZfCCfgValueReturnStatement* pValueReturnStatement,
-                                   leda::node Node, ZfCWorkList& CfgEdgeList,
-                                   ZfCWorkList& SSAEdgeList, bool& FoundNewConstant);
+    void visitValueReturnStatement(ZfCCfgValueReturnStatement* pValueReturnStatement, int Node,
+                                   ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+                                   bool& FoundNewConstant);
 
     // --- Further passes ------------------------------------------------------------------------
 

@@ -123,20 +123,16 @@ void ZfCControlFlowGraph::serveSSAEdge(int Target, ZfCWorkList& CfgEdgeList,
     }
 }
 
-void ZfCControlFlowGraph::visitIfDirty(int Number, ZfCWorkList& CfgEdgeList,
-                                       ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
+void ZfCControlFlowGraph::visitIfDirty(int Node, ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
+                                       bool& FoundNewConstant) {
     ZfCPropagationState& State = *m_pPropagation;
-    if (!State.takeDirty(Number)) {
-        State.takeAgain(Number, CfgEdgeList);
-        return;
-    }
-    leda::node Node = State.nodeOf(Number);
-    ZfCBasicBlock* pBlock = inf(Node)->isBasicBlock();
-    if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
-        visitPhiFunction(pPhi, Node, FoundNewConstant);
+    if (!State.takeDirty(Node)) {
+        State.takeAgain(Node, CfgEdgeList);
+    } else if (State.isPhiFunction(Node)) {
+        visitPhiFunction(State.phiFunctionOf(Node), Node, FoundNewConstant);
     } else {
-        ZF_ASSERT(State.isVisited(Number)); // so one of its in-edges is executable
-        visitInstruction(pBlock, Node, CfgEdgeList, SSAEdgeList, FoundNewConstant);
+        ZF_ASSERT(State.isVisited(Node)); // so one of its in-edges is executable
+        visitInstruction(State.blockOf(Node), Node, CfgEdgeList, SSAEdgeList, FoundNewConstant);
     }
 }
 

@@ -54,7 +54,7 @@ private:
 // gives value and range.
 template <class TSource>
 void visitDefinition(ZfCPropagationState& State, ZfCCfgVariable* pVariable, TSource* pSource,
-                     leda::node Node, ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
+                     int Node, ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
     // Step 1.
     ChangeWatch Watch(pVariable);
     ZfCCfgValue OldValue = Watch.oldValue();
@@ -65,7 +65,7 @@ void visitDefinition(ZfCPropagationState& State, ZfCCfgVariable* pVariable, TSou
     pVariable->setMinValueAndDestroyOld(pSource->getMinimum());
     pVariable->setMaxValueAndDestroyOld(pSource->getMaximum());
     if (Watch.hasChanged()) {
-        State.markUsersDirty(State.numberOf(Node));
+        State.markUsersDirty(Node);
     }
     // Step 5.
     if (OldValue.compare(RHSValue) == 0) {
@@ -76,7 +76,7 @@ void visitDefinition(ZfCPropagationState& State, ZfCCfgVariable* pVariable, TSou
         FoundNewConstant = true;
     }
     // Step 7: any change of value concerns the users.
-    State.appendUsers(State.numberOf(Node), SSAEdgeList);
+    State.appendUsers(Node, SSAEdgeList);
 }
 
 // The distinct operands of a phi function in the order of variables. Nearly all have few.
@@ -133,7 +133,7 @@ private:
 
 } // namespace
 
-void ZfCControlFlowGraph::visitInstruction(ZfCBasicBlock* pBlock, leda::node Node,
+void ZfCControlFlowGraph::visitInstruction(ZfCBasicBlock* pBlock, int Node,
                                            ZfCWorkList& CfgEdgeList, ZfCWorkList& SSAEdgeList,
                                            bool& FoundNewConstant) {
     // Step 1. The kinds are asked one after the other: an answer decides.
@@ -166,69 +166,50 @@ void ZfCControlFlowGraph::visitInstruction(ZfCBasicBlock* pBlock, leda::node Nod
     appendCfgOutEdges(Node, CfgEdgeList);
 }
 
-void ZfCControlFlowGraph::appendCfgOutEdges(leda::node Node, ZfCWorkList& CfgEdgeList) {
-    const int Number = m_pPropagation->numberOf(Node);
-    m_pPropagation->beginBranch(Number);
-    int Position = 0;
-    for (leda::edge e = first_adj_edge(Node); e != nullptr; e = adj_succ(e)) {
-        if (!m_pPropagation->isSSAEdge(e)) {
-            m_pPropagation->take(Number, Position++, e, CfgEdgeList);
-        }
-    }
+void ZfCControlFlowGraph::appendCfgOutEdges(int Node, ZfCWorkList& CfgEdgeList) {
+    m_pPropagation->takeBranch(Node, ZfCPropagationState::Branch::Both, CfgEdgeList);
 }
 
-void ZfCControlFlowGraph::visitAssignment(ZfCCfgAssignment* pAssignment, leda::node Node,
+void ZfCControlFlowGraph::visitAssignment(ZfCCfgAssignment* pAssignment, int Node,
                                           ZfCWorkList& /*CfgEdgeList*/, ZfCWorkList& SSAEdgeList,
                                           bool& FoundNewConstant) {
     visitDefinition(*m_pPropagation, pAssignment->getLHS(), pAssignment->getRHS(), Node,
                     SSAEdgeList, FoundNewConstant);
 }
 
-void ZfCControlFlowGraph::visitParamStatement(ZfCCfgParamStatement* pParamStatement,
-                                              leda::node Node, ZfCWorkList& /*CfgEdgeList*/,
+void ZfCControlFlowGraph::visitParamStatement(ZfCCfgParamStatement* pParamStatement, int Node,
+                                              ZfCWorkList& /*CfgEdgeList*/,
                                               ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
     visitDefinition(*m_pPropagation, pParamStatement->getVariable(), pParamStatement, Node,
                     SSAEdgeList, FoundNewConstant);
 }
 
 void ZfCControlFlowGraph::visitValueReturnStatement(
-    ZfCCfgValueReturnStatement* pValueReturnStatement, leda::node Node,
-    ZfCWorkList& /*CfgEdgeList*/, ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
+    ZfCCfgValueReturnStatement* pValueReturnStatement, int Node, ZfCWorkList& /*CfgEdgeList*/,
+    ZfCWorkList& SSAEdgeList, bool& FoundNewConstant) {
     visitDefinition(*m_pPropagation, pValueReturnStatement->getVariable(),
                     pValueReturnStatement->getExpression(), Node, SSAEdgeList, FoundNewConstant);
 }
 
-void ZfCControlFlowGraph::visitBranchCondition(ZfCCfgExpression* pCond, leda::node Node,
+void ZfCControlFlowGraph::visitBranchCondition(ZfCCfgExpression* pCond, int Node,
                                                ZfCWorkList& CfgEdgeList) {
+    using Branch = ZfCPropagationState::Branch;
     // Step 1. A condition without variables is the client's alone to answer, in each iteration.
     ZfCCfgValue Value = pCond->evaluate();
     if (!m_pPropagation->hasSSAInEdge(Node)) {
-        m_pPropagation->markDirty(m_pPropagation->numberOf(Node));
+        m_pPropagation->markDirty(Node);
     }
     // Step 3: optimistic about values, not about conditions.
     if (!Value.isConstant()) {
-        appendCfgOutEdges(Node, CfgEdgeList);
+        m_pPropagation->takeBranch(Node, Branch::Both, CfgEdgeList);
         return;
     }
     // Step 2: anything but 0.0 is true, a NaN too.
-    bool IsFalse = Value.getValue() == 0.0;
-    const int Number = m_pPropagation->numberOf(Node);
-    m_pPropagation->beginBranch(Number);
-    int Position = 0;
-    for (leda::edge e = first_adj_edge(Node); e != nullptr; e = adj_succ(e)) {
-        bool IsTaken =
-            IsFalse ? inf(e)->isFalseBranch() != nullptr : inf(e)->isTrueBranch() != nullptr;
-        if (IsTaken) {
-            m_pPropagation->take(Number, Position, e, CfgEdgeList);
-        }
-        if (!m_pPropagation->isSSAEdge(e)) {
-            ++Position;
-        }
-    }
+    m_pPropagation->takeBranch(Node, Value.getValue() == 0.0 ? Branch::False : Branch::True,
+                               CfgEdgeList);
 }
 
-void ZfCControlFlowGraph::visitPhiFunction(ZfCPhiFunction* pPhi, leda::node Node,
-                                           bool& FoundNewConstant) {
+void ZfCControlFlowGraph::visitPhiFunction(ZfCPhiFunction* pPhi, int Node, bool& FoundNewConstant) {
     // Step 1.
     ZfCCfgVariable* pVariable = pPhi->getVariable();
     ChangeWatch Watch(pVariable);
@@ -253,6 +234,6 @@ void ZfCControlFlowGraph::visitPhiFunction(ZfCPhiFunction* pPhi, leda::node Node
     pVariable->setMinValueAndDestroyOld(MinValue);
     pVariable->setMaxValueAndDestroyOld(MaxValue);
     if (Watch.hasChanged()) {
-        m_pPropagation->markUsersDirty(m_pPropagation->numberOf(Node));
+        m_pPropagation->markUsersDirty(Node);
     }
 }

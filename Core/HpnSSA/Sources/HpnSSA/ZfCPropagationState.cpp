@@ -16,25 +16,35 @@ void ZfCWorkList::grow() {
 
 ZfCPropagationState::ZfCPropagationState(Graph& Of, bool SSAEdgesAreComplete)
     : m_Graph(Of), m_SkipsCleanNodes(SSAEdgesAreComplete), m_Nodes(Of.max_node_index() + 1),
-      m_Handles(Of.max_node_index() + 1), m_Edges(Of.max_edge_index() + 1),
-      m_Records(Of.max_edge_index() + 1) {
+      m_Handles(Of.max_node_index() + 1), m_Codes(Of.max_node_index() + 1),
+      m_Edges(Of.max_edge_index() + 1), m_Records(Of.max_edge_index() + 1) {
     for (leda::node v = Of.first_node(); v != Of.stop_node(); v = Of.next_node(v)) {
         const int Number = m_Graph.index(v);
         Node& Known = m_Nodes[Number];
         m_Handles[Number] = v;
         if (ZfCBasicBlock* pBlock = Of.inf(v)->isBasicBlock()) {
             Known.IsBlock = true;
-            Known.IsPhi = pBlock->isPhiFunction() != nullptr;
             ++m_NumberOfBlocks;
+            if (ZfCPhiFunction* pPhi = pBlock->isPhiFunction()) {
+                Known.IsPhi = true;
+                m_Codes[Number].pPhi = pPhi;
+            } else {
+                m_Codes[Number].pBlock = pBlock;
+            }
         }
         for (leda::edge e = Of.first_adj_edge(v); e != nullptr; e = Of.adj_succ(e)) {
             Edge& KnownEdge = m_Edges[m_Graph.index(e)];
-            KnownEdge.Target = static_cast<unsigned int>(m_Graph.index(Of.target(e)));
-            if (Of.inf(e)->isSSAEdge() != nullptr) {
+            ZfCCfgEdgeInfo* const pRecord = Of.inf(e);
+            const int Target = m_Graph.index(Of.target(e));
+            KnownEdge.Target = static_cast<unsigned int>(Target);
+            if (pRecord->isSSAEdge() != nullptr) {
                 KnownEdge.IsSSA = 1;
                 m_HadSSAEdges = true;
             } else {
-                m_Records[m_Graph.index(e)] = Of.inf(e);
+                KnownEdge.IsTrue = pRecord->isTrueBranch() != nullptr ? 1 : 0;
+                KnownEdge.IsFalse = pRecord->isFalseBranch() != nullptr ? 1 : 0;
+                m_Records[m_Graph.index(e)] = pRecord;
+                ++m_Nodes[Target].InCount;
             }
         }
         describe(Number);
@@ -129,7 +139,7 @@ void ZfCPropagationState::markParametersDirty() {
         if (!m_Nodes[i].IsBlock) {
             continue;
         }
-        ZfCCfgStatement* pStmt = m_Graph.inf(m_Handles[i])->isBasicBlock()->isStatement();
+        ZfCCfgStatement* pStmt = m_Nodes[i].IsPhi ? nullptr : blockOf(i)->isStatement();
         if (pStmt != nullptr && pStmt->isParamStatement() != nullptr) {
             markDirty(i);
         }
@@ -146,13 +156,28 @@ void ZfCPropagationState::appendOnlyCfgOutEdge(int v, ZfCWorkList& CfgEdgeList) 
     }
 }
 
-void ZfCPropagationState::take(int v, int Position, leda::edge e, ZfCWorkList& CfgEdgeList) {
-    CfgEdgeList.append(m_Graph.index(e));
+// Of more edges than are remembered any may be taken, so the node stays dirty.
+void ZfCPropagationState::takeBranch(int v, Branch Which, ZfCWorkList& CfgEdgeList) {
     Node& Known = m_Nodes[v];
-    if (Position < s_MostRemembered) {
-        Known.Taken = static_cast<unsigned char>(Known.Taken | (1U << Position));
-    } else {
-        Known.IsDirty = true; // too many to remember: always visited
+    if (!Known.IsDescribed) {
+        describe(v);
+    }
+    Known.Taken = 0;
+    if (Known.OutCount <= s_MostRemembered) {
+        for (int i = 0; i < Known.OutCount; ++i) {
+            if (isTaken(Known.Out[i], Which)) {
+                CfgEdgeList.append(Known.Out[i]);
+                Known.Taken = static_cast<unsigned char>(Known.Taken | (1U << i));
+            }
+        }
+        return;
+    }
+    Known.IsDirty = true;
+    for (leda::edge e = m_Graph.first_adj_edge(m_Handles[v]); e != nullptr;
+         e = m_Graph.adj_succ(e)) {
+        if (!isSSAEdge(e) && isTaken(m_Graph.index(e), Which)) {
+            CfgEdgeList.append(m_Graph.index(e));
+        }
     }
 }
 
@@ -195,15 +220,6 @@ void ZfCPropagationState::appendUsers(int v, ZfCWorkList& SSAEdgeList) {
     forEachUser(v, [&SSAEdgeList](int Target) { SSAEdgeList.append(Target); });
 }
 
-bool ZfCPropagationState::hasSSAInEdge(leda::node v) const {
-    for (leda::edge e = m_Graph.first_in_edge(v); e != nullptr; e = m_Graph.in_succ(e)) {
-        if (isSSAEdge(e)) {
-            return true;
-        }
-    }
-    return false;
-}
-
 void ZfCPropagationState::forget(leda::node v) {
     for (leda::edge e = m_Graph.first_in_edge(v); e != nullptr; e = m_Graph.in_succ(e)) {
         if (!isSSAEdge(e)) {
@@ -216,6 +232,7 @@ void ZfCPropagationState::forget(leda::node v) {
     for (leda::edge e = m_Graph.first_adj_edge(v); e != nullptr; e = m_Graph.adj_succ(e)) {
         if (!isSSAEdge(e)) {
             m_Records[m_Graph.index(e)] = nullptr;
+            --m_Nodes[m_Graph.index(m_Graph.target(e))].InCount;
         }
     }
     m_Nodes[m_Graph.index(v)].IsGone = true;

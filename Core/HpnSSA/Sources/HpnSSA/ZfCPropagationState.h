@@ -7,7 +7,8 @@
 #include "ZfCCfgEdgeInfo.h"
 #include "ZfCCfgNodeInfo.h"
 
-class ZfCControlFlowGraph;
+class ZfCBasicBlock;
+class ZfCPhiFunction;
 
 // A first-in first-out work list of numbers: of edges, or of nodes. A ring that doubles when it is
 // full, so that a run allocates hardly ever.
@@ -75,9 +76,12 @@ public:
 
     // ---- nodes ----
 
-    // The number of a node, and the node of a number.
+    // The number of a node.
     int numberOf(leda::node v) const { return m_Graph.index(v); }
-    leda::node nodeOf(int v) const { return m_Handles[v]; }
+    // Where a visit begins: the phi function of a node that is one, the code of any other basic
+    // block.
+    ZfCPhiFunction* phiFunctionOf(int v) const { return m_Codes[v].pPhi; }
+    ZfCBasicBlock* blockOf(int v) const { return m_Codes[v].pBlock; }
     // Whether control has arrived at the node in this iteration.
     bool isVisited(int v) const { return m_Nodes[v].IsVisited; }
     // Marks a basic block as reached; true at the first arrival.
@@ -94,10 +98,10 @@ public:
     // The definitions that hang on the calls, not on their operands alone.
     void markParametersDirty();
 
-    // The visit appends control flow out-edges: from here on they are remembered.
-    void beginBranch(int v) { m_Nodes[v].Taken = 0; }
-    // Appends the CFG out-edge at that place among them, and remembers that.
-    void take(int v, int Position, leda::edge e, ZfCWorkList& CfgEdgeList);
+    // Appends all control flow out-edges, those of true branches, or those of false branches, in
+    // adjacency order, and remembers them.
+    enum class Branch { Both, True, False };
+    void takeBranch(int v, Branch Which, ZfCWorkList& CfgEdgeList);
     // Appends what the last visit appended.
     void takeAgain(int v, ZfCWorkList& CfgEdgeList);
 
@@ -120,8 +124,8 @@ public:
     bool isExecutable(int e) const { return m_Edges[e].IsExecutable != 0; }
     // Control can pass here; stays so until the next beginIteration.
     void setExecutable(int e) { m_Edges[e].IsExecutable = 1; }
-    // Whether a definition reaches the node; costs the in-edges up to the first SSA edge.
-    bool hasSSAInEdge(leda::node v) const;
+    // Whether a definition reaches the node.
+    bool hasSSAInEdge(int v) const { return m_Graph.indeg(m_Handles[v]) != m_Nodes[v].InCount; }
 
     // ---- removal ----
 
@@ -140,6 +144,7 @@ private:
 
         int Out[2] = {s_None, s_None}; // the first two control flow out-edges
         int FirstUser = s_None;        // place in m_Users
+        int InCount = 0;               // control flow in-edges
         bool IsVisited : 1;
         bool IsDirty : 1;
         bool IsBlock : 1;
@@ -151,9 +156,11 @@ private:
     };
     // What is known of an edge that was there when the run began.
     struct Edge {
-        Edge() : Target(0), IsSSA(0), IsExecutable(0) {}
+        Edge() : Target(0), IsTrue(0), IsFalse(0), IsSSA(0), IsExecutable(0) {}
 
-        unsigned int Target : 30;
+        unsigned int Target : 28;
+        unsigned int IsTrue : 1; // by its record
+        unsigned int IsFalse : 1;
         unsigned int IsSSA : 1;
         unsigned int IsExecutable : 1;
     };
@@ -164,10 +171,21 @@ private:
         unsigned int Target : 31;
         unsigned int IsLast : 1; // of those of one definition
     };
+    // See phiFunctionOf and blockOf.
+    union Code {
+        Code() : pBlock(nullptr) {}
+
+        ZfCBasicBlock* pBlock;
+        ZfCPhiFunction* pPhi;
+    };
     static constexpr int s_None = -1;
     static constexpr int s_MostRemembered = 2;
 
     void describe(int v);
+    bool isTaken(int e, Branch Which) const {
+        return Which == Branch::Both ||
+               (Which == Branch::True ? m_Edges[e].IsTrue : m_Edges[e].IsFalse) != 0;
+    }
     void collectUsers();
     void appendUser(int Definition, int Target);
     template <class Action>
@@ -181,6 +199,7 @@ private:
     int m_NumberOfUsers = 0;
     leda::array<Node> m_Nodes;
     leda::array<leda::node> m_Handles; // of the nodes
+    leda::array<Code> m_Codes;
     leda::array<Edge> m_Edges;
     leda::array<ZfCCfgEdgeInfo*> m_Records; // of the control flow edges; null for others
     leda::array<User> m_Users;              // those of one definition in a row
