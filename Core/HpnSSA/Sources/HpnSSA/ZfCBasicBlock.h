@@ -30,6 +30,14 @@ public:
     leda::set<ZfCCfgVariable*, leda::avl_tree> getUsedVariables() override;
     ZfCBasicBlock* isBasicBlock() override;
 
+    // Does something with each variable of getAssignedVariables, and of getUsedVariables, without
+    // making the list or the set of them: for sweeps over all blocks. One that is used by several
+    // phi functions or statements, or twice by a phi function, comes several times, in no order.
+    template <class TAction>
+    void forEachAssignedVariable(TAction Do);
+    template <class TAction>
+    void forEachUsedVariable(TAction Do);
+
 private:
     ZfCBasicBlock();
     ~ZfCBasicBlock() override;
@@ -89,5 +97,35 @@ private:
     ZfCCfgExpression* m_pBranchCond;
     leda::list<ZfCCfgVariable*> m_AssignedVariables; // cache of getAssignedVariables
 };
+
+template <class TAction>
+void ZfCBasicBlock::forEachAssignedVariable(TAction Do) {
+    // A list that has been made counts as it stands.
+    if (!m_AssignedVariables.empty()) {
+        for (ZfCCfgVariable* pVariable : m_AssignedVariables)
+            Do(pVariable);
+        return;
+    }
+    for (ZfCPhiFunction* pPhiFunction : m_PhiFunctions)
+        Do(pPhiFunction->getVariable());
+    for (ZfCCfgStatement* pStmt : m_StatementSeq)
+        for (ZfCCfgVariable* pVariable : pStmt->getDefinedVariables())
+            Do(pVariable);
+}
+
+template <class TAction>
+void ZfCBasicBlock::forEachUsedVariable(TAction Do) {
+    for (ZfCPhiFunction* pPhiFunction : m_PhiFunctions) {
+        leda::array<ZfCCfgVariable*> const& Operands = pPhiFunction->showReplacementVariables();
+        for (int i = 0; i < Operands.size(); ++i)
+            Do(Operands[i]);
+    }
+    for (ZfCCfgStatement* pStmt : m_StatementSeq)
+        for (ZfCCfgVariable* pVariable : pStmt->getUsedVariables())
+            Do(pVariable);
+    if (m_pBranchCond != nullptr)
+        for (ZfCCfgVariable* pVariable : m_pBranchCond->getUsedVariables())
+            Do(pVariable);
+}
 
 #endif

@@ -113,6 +113,8 @@ public:
     // an assertion.
     int delUse(leda::node v);
     leda::set<leda::node, leda::avl_tree> getUses() { return m_Uses; }
+    // The nodes themselves, valid until a use comes or goes.
+    leda::set<leda::node, leda::avl_tree> const& showUses() const { return m_Uses; }
     // The uses of this variable and of its virtual aliases.
     leda::set<leda::node, leda::avl_tree> getAllUses();
     void clearUses() { m_Uses.clear(); }

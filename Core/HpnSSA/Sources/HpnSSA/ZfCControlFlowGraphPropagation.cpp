@@ -46,18 +46,20 @@ void ZfCControlFlowGraph::sparseConditionalConstant(bool RemoveDeadCode) {
     sparseConditionalConstant(RemoveDeadCode, State);
 }
 
+// No block but a basic block assigns or uses a variable.
 void ZfCControlFlowGraph::buildVarUses() {
     // Step 1.
     for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
-        for (ZfCCfgVariable* pVariable : inf(v)->getAssignedVariables()) {
-            pVariable->clearUses();
+        if (ZfCBasicBlock* pBlock = inf(v)->isBasicBlock()) {
+            pBlock->forEachAssignedVariable(
+                [](ZfCCfgVariable* pVariable) { pVariable->clearUses(); });
         }
     }
     // Step 2.
     for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
-        leda::set<ZfCCfgVariable*, leda::avl_tree> UsedVariables = inf(v)->getUsedVariables();
-        for (ZfCCfgVariable* pVariable : UsedVariables) {
-            pVariable->appendUse(v);
+        if (ZfCBasicBlock* pBlock = inf(v)->isBasicBlock()) {
+            pBlock->forEachUsedVariable(
+                [v](ZfCCfgVariable* pVariable) { pVariable->appendUse(v); });
         }
     }
 }
@@ -69,15 +71,18 @@ void ZfCControlFlowGraph::addSSAEdges() {
     // Step 2.
     for (leda::node DefiningNode = first_node(); DefiningNode != stop_node();
          DefiningNode = next_node(DefiningNode)) {
-        for (ZfCCfgVariable* pVariable : inf(DefiningNode)->getAssignedVariables()) {
-            leda::set<leda::node, leda::avl_tree> UsingNodes = pVariable->getUses();
-            for (leda::node UsingNode : UsingNodes) {
+        ZfCBasicBlock* pBlock = inf(DefiningNode)->isBasicBlock();
+        if (pBlock == nullptr) {
+            continue;
+        }
+        pBlock->forEachAssignedVariable([&](ZfCCfgVariable* pVariable) {
+            for (leda::node UsingNode : pVariable->showUses()) {
                 new_edge(DefiningNode, UsingNode, pFactory->createSSAEdge());
                 if (m_pPropagation != nullptr) {
                     m_pPropagation->addUser(DefiningNode, UsingNode);
                 }
             }
-        }
+        });
     }
 }
 
