@@ -64,6 +64,7 @@ void ZfCCfgVariable::resetData() {
     m_Index = 0;
     m_Uses.clear();
     m_Rare.resize(0);
+    m_pOrigOrTop = nullptr;
     m_IsArray = false;
     m_IsErasable = false;
     m_IsVolatile = false;

@@ -100,12 +100,18 @@ public:
     ZfCCfgValue const& getValue() { return m_Value; }
 
     // The stack of renaming. pop gives the popped version; top gives null when the stack is empty.
-    void pushSSAReplacement(ZfCCfgVariable* pVariable) { rare().m_SSAReplacements.push(pVariable); }
-    ZfCCfgVariable* popSSAReplacement() { return rare().m_SSAReplacements.pop(); }
-    ZfCCfgVariable* topSSAReplacement() {
-        return hasRare() && !rare().m_SSAReplacements.empty() ? rare().m_SSAReplacements.top()
-                                                              : nullptr;
+    void pushSSAReplacement(ZfCCfgVariable* pVariable) {
+        rare().m_SSAReplacements.push(pVariable);
+        if (!m_IsVersion)
+            m_pOrigOrTop = pVariable;
     }
+    ZfCCfgVariable* popSSAReplacement() {
+        ZfCCfgVariable* const pPopped = rare().m_SSAReplacements.pop();
+        if (!m_IsVersion)
+            m_pOrigOrTop = topOfStack();
+        return pPopped;
+    }
+    ZfCCfgVariable* topSSAReplacement() { return m_IsVersion ? topOfStack() : m_pOrigOrTop; }
 
     // The nodes that use this variable; valid until the graph is edited.
     void appendUse(leda::node v) { m_Uses.insert(v); }
@@ -172,12 +178,19 @@ private:
         return m_Rare[0];
     }
 
-    // What the propagation asks of an operand fills one cache line, the first: the value, and of a
-    // version its original and its range, numbers and kinds. Only ZfCSSAVariable uses the latter.
+    ZfCCfgVariable* topOfStack() {
+        return hasRare() && !rare().m_SSAReplacements.empty() ? rare().m_SSAReplacements.top()
+                                                              : nullptr;
+    }
+
+    // What renaming asks of a variable and the propagation of an operand fills one cache line, the
+    // first: the value, and of a version its original and its range, numbers and kinds. Only
+    // ZfCSSAVariable uses the range.
     unsigned int m_Index;
     int m_DebugIndex; // written by the constructor alone
     ZfCCfgValue m_Value;
-    ZfCCfgVariable* m_pOrigVar = nullptr; // not owned
+    // Of a version its original, not owned; of an original the top of its stack of renaming.
+    ZfCCfgVariable* m_pOrigOrTop = nullptr;
     double m_MinValue = 0.0;
     double m_MaxValue = 0.0;
     unsigned char m_MinKind = eCfgValueConstant;
@@ -185,6 +198,7 @@ private:
     bool m_IsArray;
     bool m_IsErasable;
     bool m_IsVolatile;
+    bool m_IsVersion = false;
 
     leda::set<leda::node, leda::avl_tree> m_Uses; // stale after any graph edit
     ZfCCfgVariable* m_pNonVirtualAlias;           // this, unless a virtual alias

@@ -11,6 +11,7 @@ ZfCCfgValue valueOf(double Number, unsigned char Kind) {
 } // namespace
 
 ZfCSSAVariable::ZfCSSAVariable(ZfCCfgVariable* pVar) {
+    m_IsVersion = true;
     bindTo(pVar);
 }
 
@@ -26,7 +27,6 @@ void ZfCSSAVariable::resetData() {
     ZfCCfgVariable::resetData();
     setMax(ZfCCfgValue());
     setMin(ZfCCfgValue());
-    m_pOrigVar = nullptr;
 }
 
 // The markers come from the variable as given, not from the original behind it: a version may be
@@ -45,7 +45,7 @@ void ZfCSSAVariable::bindTo(ZfCCfgVariable* pVar) {
 
 void ZfCSSAVariable::setOrigVar(ZfCCfgVariable* pVar) {
     ZfCSSAVariable* const pVersion = pVar->isSSAVariable();
-    m_pOrigVar = pVersion != nullptr ? pVersion->getOrigVar() : pVar;
+    m_pOrigOrTop = pVersion != nullptr ? pVersion->getOrigVar() : pVar;
 }
 
 void ZfCSSAVariable::setMinValueAndDestroyOld(ZfCCfgValue const& Value) {
@@ -91,31 +91,31 @@ void ZfCSSAVariable::setMax(ZfCCfgValue const& Value) {
 }
 
 ZF_DataType* ZfCSSAVariable::getDataType() {
-    return m_pOrigVar->getDataType();
+    return m_pOrigOrTop->getDataType();
 }
 
 ZF_Scaling* ZfCSSAVariable::getScaling() {
-    return m_pOrigVar->getScaling();
+    return m_pOrigOrTop->getScaling();
 }
 
 bool ZfCSSAVariable::isUpperBorderSaturated() {
-    return m_pOrigVar->isUpperBorderSaturated();
+    return m_pOrigOrTop->isUpperBorderSaturated();
 }
 
 bool ZfCSSAVariable::isLowerBorderSaturated() {
-    return m_pOrigVar->isLowerBorderSaturated();
+    return m_pOrigOrTop->isLowerBorderSaturated();
 }
 
 double ZfCSSAVariable::getUpperLimit() {
-    return m_pOrigVar->getUpperLimit();
+    return m_pOrigOrTop->getUpperLimit();
 }
 
 double ZfCSSAVariable::getLowerLimit() {
-    return m_pOrigVar->getLowerLimit();
+    return m_pOrigOrTop->getLowerLimit();
 }
 
 ZfCCfgValue ZfCSSAVariable::getInitValue() {
-    return m_pOrigVar->getInitValue();
+    return m_pOrigOrTop->getInitValue();
 }
 
 ZfCSSAVariable* ZfCSSAVariable::isSSAVariable() {

@@ -38,7 +38,7 @@ public:
     ZfCSSAVariable* isSSAVariable() override;
 
     // The variable that this is a version of; null while parked.
-    ZfCCfgVariable* getOrigVar() { return m_pOrigVar; }
+    ZfCCfgVariable* getOrigVar() { return m_pOrigOrTop; }
     // Takes the original behind pVar when that is a version itself, so that there are no chains.
     void setOrigVar(ZfCCfgVariable* pVar);
 
