@@ -87,7 +87,8 @@ void* ZfCPooledMemController::allocateFromPage(std::size_t Class) {
     if (static_cast<std::size_t>(m_pEnd[Class] - m_pCursor[Class]) < Bytes) {
         if (m_PagesLeft == 0 && !addChunk())
             return nullptr;
-        m_pCursor[Class] = reinterpret_cast<char*>(::new (m_pNextPage) Header{nullptr, Class} + 1);
+        ::new (m_pNextPage) Header{nullptr, Class};
+        m_pCursor[Class] = m_pNextPage + s_FirstBlock;
         m_pEnd[Class] = m_pNextPage + s_PageBytes;
         m_pNextPage += s_PageBytes;
         --m_PagesLeft;

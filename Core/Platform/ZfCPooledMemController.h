@@ -22,26 +22,29 @@ public:
     // Gives all pages back: no small block may be in use any more.
     ~ZfCPooledMemController() override;
 
-    // A block aligned to 16 bytes, the caller's until freeMemBlock; null if there is no memory.
+    // A block aligned for any object of the size: to 16 bytes, or to 8 if the size rounded up to 8
+    // is no multiple of 16. The caller's until freeMemBlock; null if there is no memory.
     void* allocMemBlock(unsigned int Size) override;
     // Takes back a block of this controller.
     void freeMemBlock(void* pBlock) override;
 
 private:
-    static constexpr std::size_t s_Granule = 16;
+    static constexpr std::size_t s_Granule = 8;
+    static constexpr std::size_t s_LargestAlignment = 16;
+    static constexpr std::size_t s_FirstBlock = 64; // in a page: its cache lines are the blocks'
     static constexpr std::size_t s_GreatestSmall = 1024;
     static constexpr std::size_t s_PageBytes = 64 * 1024;
     static constexpr std::size_t s_PagesInFirstChunk = 3;
 
     // At the begin of each page and of each large block.
-    struct alignas(s_Granule) Header {
+    struct alignas(s_LargestAlignment) Header {
         void* pMemory;     // of a large block: what malloc gave; else null
         std::size_t Class; // of a page: the size of its blocks in granules
     };
     struct FreeBlock {
         FreeBlock* pNext;
     };
-    struct alignas(s_Granule) Chunk {
+    struct alignas(s_LargestAlignment) Chunk {
         Chunk* pNext;
     };
 
