@@ -17,7 +17,7 @@ void collectVariables(const Term* pTerm, leda::set<ZfCCfgVariable*, leda::avl_tr
     if (pTerm == nullptr)
         return;
     // The array that a store writes is the left-hand side's business.
-    if (pTerm->pVariable != nullptr && !pTerm->IsStore)
+    if (pTerm->hasVariable() && !pTerm->isStore())
         Variables.insert(pTerm->pVariable);
     collectVariables(pTerm->pLeft, Variables);
     collectVariables(pTerm->pRight, Variables);
@@ -26,17 +26,17 @@ void collectVariables(const Term* pTerm, leda::set<ZfCCfgVariable*, leda::avl_tr
 void replaceRead(Term* pTerm, ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
     if (pTerm == nullptr)
         return;
-    if (pTerm->pVariable == pOld && !pTerm->IsStore)
+    if (pTerm->hasVariable() && pTerm->pVariable == pOld && !pTerm->isStore())
         pTerm->pVariable = pNew;
     replaceRead(pTerm->pLeft, pOld, pNew);
     replaceRead(pTerm->pRight, pOld, pNew);
 }
 
 void becomeNumber(Term* pTerm, double Number) {
-    const hpn::SourcePosition Position = pTerm->Position;
+    const hpn::SourcePosition Position = pTerm->getPosition();
     *pTerm = Term();
     pTerm->Number = Number;
-    pTerm->Position = Position;
+    pTerm->setPosition(Position);
 }
 
 void replaceConstantReads(Term* pTerm) {
@@ -44,7 +44,8 @@ void replaceConstantReads(Term* pTerm) {
         return;
     if (pTerm->Op == Operator::Variable) {
         const ZfCCfgValue& Value = pTerm->pVariable->getValue();
-        if (Value.isConstant() && hpn::mayRewrite("read replaced by a constant", pTerm->Position))
+        if (Value.isConstant() &&
+            hpn::mayRewrite("read replaced by a constant", pTerm->getPosition()))
             becomeNumber(pTerm, Value.getValue());
         return;
     }
@@ -136,7 +137,7 @@ private:
     bool noteReads(const Term* pTerm) {
         if (pTerm == nullptr)
             return true;
-        if (pTerm->pVariable != nullptr) {
+        if (pTerm->hasVariable()) {
             if (m_NumberOfReads == s_MostReads)
                 return false;
             ZfCCfgVariable* pVariable = pTerm->pVariable;
@@ -205,7 +206,7 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
     if (Value.isConstant() && std::isnan(Value.getValue()))
         return ZfCCfgValue(eCfgValueNonConstant);
     if (Value.isConstant()) {
-        if (pBudget != nullptr && !pBudget->maySettle(this, m_pRoot->Position))
+        if (pBudget != nullptr && !pBudget->maySettle(this, m_pRoot->getPosition()))
             return ZfCCfgValue(eCfgValueNonConstant);
         m_IsSettled = true;
         m_SettledNumber = Value.getValue();
@@ -257,7 +258,7 @@ void ZfCCfgSFExpression::replaceConstantCondition() {
         return;
     ZfCCfgValue Value = evaluate();
     if (Value.isConstant() && m_pRoot->Op != Operator::Number &&
-        hpn::mayRewrite("condition replaced by its value", m_pRoot->Position)) {
+        hpn::mayRewrite("condition replaced by its value", m_pRoot->getPosition())) {
         s_LastEvaluation.forget();
         becomeNumber(m_pRoot, Value.getValue());
     }
@@ -271,7 +272,7 @@ void ZfCCfgSFExpression::foldConstants() {
         Term* pFolded = pArena->copy(m_pRoot);
         hpn::foldTerm(pFolded);
         if (hpn::isSameTerm(pFolded, m_pRoot) ||
-            !hpn::mayRewrite("expression folded", m_pRoot->Position))
+            !hpn::mayRewrite("expression folded", m_pRoot->getPosition()))
             return;
     }
     hpn::foldTerm(m_pRoot);
@@ -279,7 +280,8 @@ void ZfCCfgSFExpression::foldConstants() {
 
 ZfCCfgVariable* ZfCCfgSFExpression::isVariable(bool& Negated) {
     ZfCCfgVariable* pVariable = offeredVariable(stripNegations(m_pRoot, Negated));
-    if (pVariable != nullptr && !hpn::mayRewrite("note taken from a branch", m_pRoot->Position))
+    if (pVariable != nullptr &&
+        !hpn::mayRewrite("note taken from a branch", m_pRoot->getPosition()))
         return nullptr;
     return pVariable;
 }
@@ -296,7 +298,7 @@ bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, Z
     ZfCCfgVariable* pRead = offeredVariable(pLeft);
     if (pRead == nullptr || pRight->Op != Operator::Number ||
         !isTellingConstant(pRead, pRight->Number) ||
-        !hpn::mayRewrite("note taken from a branch", m_pRoot->Position))
+        !hpn::mayRewrite("note taken from a branch", m_pRoot->getPosition()))
         return false;
     pVariable = pRead;
     Value = ZfCCfgValue(pRight->Number);
@@ -314,5 +316,6 @@ ZfCCfgSFExpression* ZfCCfgSFExpression::isSFExpression() {
 
 void ZfCCfgSFExpression::actOnComparisonOutsideBoolRange() {
     hpn::pendingWarnings().push_back(
-        {m_pRoot->Position, "a Boolean variable is compared with a number other than 0 and 1"});
+        {m_pRoot->getPosition(),
+         "a Boolean variable is compared with a number other than 0 and 1"});
 }
