@@ -13,14 +13,15 @@ using hpn::Term;
 
 namespace {
 
-void collectVariables(const Term* pTerm, leda::set<ZfCCfgVariable*, leda::avl_tree>& Variables) {
+/// Calls `take` for each read until it answers false; whether it never did.
+template <class Visitor>
+bool forEachRead(const Term* pTerm, const Visitor& take) {
     if (pTerm == nullptr)
-        return;
+        return true;
     // The array that a store writes is the left-hand side's business.
-    if (pTerm->hasVariable() && !pTerm->isStore())
-        Variables.insert(pTerm->pVariable);
-    collectVariables(pTerm->pLeft, Variables);
-    collectVariables(pTerm->pRight, Variables);
+    if (pTerm->hasVariable() && !pTerm->isStore() && !take(pTerm->pVariable))
+        return false;
+    return forEachRead(pTerm->pLeft, take) && forEachRead(pTerm->pRight, take);
 }
 
 void replaceRead(Term* pTerm, ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
@@ -102,9 +103,19 @@ public:
     const ZfCCfgValue& value() const { return m_Value; }
     const hpn::ValueRange& range() const { return m_Range; }
 
+    /// Of a term with so many reads that they are not at hand they are looked for.
     void remember(const Term* pRoot, const ZfCCfgValue& Value, const hpn::ValueRange& Range) {
         m_NumberOfReads = 0;
-        m_pRoot = noteReads(pRoot) ? pRoot : nullptr;
+        const auto take = [this](ZfCCfgVariable* pVariable) { return noteRead(pVariable); };
+        m_pRoot = forEachRead(pRoot, take) ? pRoot : nullptr;
+        m_Value = Value;
+        m_Range = Range;
+    }
+    void remember(const Term* pRoot, ZfCCfgVariable* const* pReads, std::size_t Number,
+                  const ZfCCfgValue& Value, const hpn::ValueRange& Range) {
+        m_NumberOfReads = 0;
+        std::for_each(pReads, pReads + Number, [this](ZfCCfgVariable* p) { noteRead(p); });
+        m_pRoot = pRoot;
         m_Value = Value;
         m_Range = Range;
     }
@@ -121,7 +132,7 @@ private:
         ZfCCfgValue Minimum;
         ZfCCfgValue Maximum;
     };
-    static constexpr int s_MostReads = 4; // terms with more are computed again
+    static constexpr int s_MostReads = 8; // terms with more are computed again
 
     static bool isSame(const ZfCCfgValue& a, const ZfCCfgValue& b) {
         return a.getValueKind() == b.getValueKind() &&
@@ -134,17 +145,12 @@ private:
                isSame(Of.Maximum, Of.pVariable->getMaxValue());
     }
 
-    bool noteReads(const Term* pTerm) {
-        if (pTerm == nullptr)
-            return true;
-        if (pTerm->hasVariable()) {
-            if (m_NumberOfReads == s_MostReads)
-                return false;
-            ZfCCfgVariable* pVariable = pTerm->pVariable;
-            m_Reads[m_NumberOfReads++] = {pVariable, pVariable->getValue(),
-                                          pVariable->getMinValue(), pVariable->getMaxValue()};
-        }
-        return noteReads(pTerm->pLeft) && noteReads(pTerm->pRight);
+    bool noteRead(ZfCCfgVariable* pVariable) {
+        if (m_NumberOfReads == s_MostReads)
+            return false;
+        m_Reads[m_NumberOfReads++] = {pVariable, pVariable->getValue(), pVariable->getMinValue(),
+                                      pVariable->getMaxValue()};
+        return true;
     }
 
     const Term* m_pRoot = nullptr;
@@ -162,25 +168,52 @@ LastEvaluation s_LastEvaluation;
 // The arena may give out the term of an earlier program again.
 ZfCCfgSFExpression::ZfCCfgSFExpression(Term* pRoot) : m_pRoot(pRoot) {
     s_LastEvaluation.forget();
+    noteReads();
 }
 
 ZfCCfgSFExpression::~ZfCCfgSFExpression() = default;
 
 leda::set<ZfCCfgVariable*, leda::avl_tree> ZfCCfgSFExpression::getUsedVariables() {
     leda::set<ZfCCfgVariable*, leda::avl_tree> Variables;
-    collectVariables(m_pRoot, Variables);
+    const auto take = [&Variables](ZfCCfgVariable* pVariable) {
+        Variables.insert(pVariable);
+        return true;
+    };
+    if (m_NumberOfReads == s_ManyReads)
+        forEachRead(m_pRoot, take);
+    else
+        std::for_each(m_Reads, m_Reads + m_NumberOfReads, take);
     return Variables;
+}
+
+void ZfCCfgSFExpression::noteReads() {
+    m_NumberOfReads = 0;
+    const auto take = [this](ZfCCfgVariable* pVariable) {
+        ZfCCfgVariable** pEnd = m_Reads + m_NumberOfReads;
+        if (std::find(m_Reads, pEnd, pVariable) != pEnd)
+            return true;
+        if (m_NumberOfReads == s_MostReads)
+            return false;
+        m_Reads[m_NumberOfReads++] = pVariable;
+        return true;
+    };
+    if (!forEachRead(m_pRoot, take))
+        m_NumberOfReads = s_ManyReads;
 }
 
 void ZfCCfgSFExpression::replaceVariable(ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
     s_LastEvaluation.forget();
     replaceRead(m_pRoot, pOld, pNew);
+    // Where the new one was read before it stands here twice now, which harms nobody.
+    if (m_NumberOfReads != s_ManyReads)
+        std::replace(m_Reads, m_Reads + m_NumberOfReads, pOld, pNew);
     m_IsSettled = false;
 }
 
 void ZfCCfgSFExpression::replaceConditionWithConstant(double Number) {
     s_LastEvaluation.forget();
     becomeNumber(m_pRoot, Number);
+    m_NumberOfReads = 0;
     m_IsSettled = false;
 }
 
@@ -196,8 +229,7 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
     if (!Value.isConstant() && m_pRoot->Op != Operator::Element) {
         // An undetermined operand counts with all that its type can hold, so a single number holds
         // whatever it becomes.
-        const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
-        s_LastEvaluation.remember(m_pRoot, Value, Range);
+        const hpn::ValueRange Range = evaluateRange(Value);
         if (Range.isSingle())
             Value = ZfCCfgValue(Range.Low);
     }
@@ -226,6 +258,16 @@ ZfCCfgValue ZfCCfgSFExpression::getEndOfNumber(double Number) {
     return std::isnan(Number) ? ZfCCfgValue(eCfgValueNonConstant) : ZfCCfgValue(Number);
 }
 
+/// Remembers it with the value for the questions that follow.
+hpn::ValueRange ZfCCfgSFExpression::evaluateRange(const ZfCCfgValue& Value) {
+    const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
+    if (m_NumberOfReads == s_ManyReads)
+        s_LastEvaluation.remember(m_pRoot, Value, Range);
+    else
+        s_LastEvaluation.remember(m_pRoot, m_Reads, m_NumberOfReads, Value, Range);
+    return Range;
+}
+
 ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
     if (isMarkedAsEvalToNonConst() || m_pRoot->Op == Operator::Element)
         return ZfCCfgValue(eCfgValueNonConstant);
@@ -235,8 +277,7 @@ ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
         const ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
         if (Value.isConstant())
             return getEndOfNumber(Value.getValue());
-        s_LastEvaluation.remember(m_pRoot, Value,
-                                  hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation));
+        evaluateRange(Value);
     }
     const ZfCCfgValue Value = s_LastEvaluation.value();
     const hpn::ValueRange& Range = s_LastEvaluation.range();
@@ -247,9 +288,18 @@ ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
     return ZfCCfgValue(IsMaximum ? Range.High : Range.Low);
 }
 
+bool ZfCCfgSFExpression::mayReadConstant() const {
+    return m_NumberOfReads == s_ManyReads ||
+           std::any_of(m_Reads, m_Reads + m_NumberOfReads,
+                       [](ZfCCfgVariable* p) { return p->getValue().isConstant(); });
+}
+
 void ZfCCfgSFExpression::replaceConstantVariables() {
+    if (!mayReadConstant())
+        return;
     s_LastEvaluation.forget();
     replaceConstantReads(m_pRoot);
+    noteReads();
 }
 
 void ZfCCfgSFExpression::replaceConstantCondition() {
@@ -261,6 +311,7 @@ void ZfCCfgSFExpression::replaceConstantCondition() {
         hpn::mayRewrite("condition replaced by its value", m_pRoot->getPosition())) {
         s_LastEvaluation.forget();
         becomeNumber(m_pRoot, Value.getValue());
+        m_NumberOfReads = 0;
     }
 }
 
@@ -276,6 +327,8 @@ void ZfCCfgSFExpression::foldConstants() {
             return;
     }
     hpn::foldTerm(m_pRoot);
+    if (m_NumberOfReads > 0)
+        noteReads();
 }
 
 ZfCCfgVariable* ZfCCfgSFExpression::isVariable(bool& Negated) {
@@ -307,7 +360,10 @@ bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, Z
 }
 
 bool ZfCCfgSFExpression::hasSideEffects() {
-    return hpn::readsInput(m_pRoot);
+    if (m_NumberOfReads == s_ManyReads)
+        return hpn::readsInput(m_pRoot);
+    return std::any_of(m_Reads, m_Reads + m_NumberOfReads,
+                       [](ZfCCfgVariable* p) { return hpn::originalOf(p)->isReadASideEffect(); });
 }
 
 ZfCCfgSFExpression* ZfCCfgSFExpression::isSFExpression() {
