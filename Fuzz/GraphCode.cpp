@@ -257,9 +257,9 @@ private:
         const Term* pRoot = pRHS->getRoot();
         const Variable& Target = originalOf(pAssignment->getLHS())->getDeclaration();
         ActionStep Step;
-        const Term* pValue = pRoot->IsStore ? pRoot->pRight : pRoot;
+        const Term* pValue = pRoot->isStore() ? pRoot->pRight : pRoot;
         Step.MustFit = pValue->Op != Operator::Cast || pValue->pType != Target.pType;
-        if (pRoot->IsStore) {
+        if (pRoot->isStore()) {
             Step.Op = ActionOp::Store;
             Step.A = static_cast<std::int32_t>(Target.Index);
             Step.Index = codeOf(pRoot->pLeft);

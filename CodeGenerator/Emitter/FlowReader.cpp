@@ -116,7 +116,7 @@ void FlowReader::readAssignment(ZfCCfgAssignment* pAssignment) {
     FlowItem Item{FlowItemKind::Assign};
     Item.pTerm = pTerm;
     Item.pTarget = declarationOf(pAssignment->getLHS());
-    if (!pTerm->IsStore && isSelfCopy(pTerm, Item.pTarget))
+    if (!pTerm->isStore() && isSelfCopy(pTerm, Item.pTarget))
         return;
     if (m_LeftOut.count(Item.pTarget) != 0) {
         if (!readsInput(pTerm))

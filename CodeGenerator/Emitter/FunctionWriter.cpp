@@ -226,7 +226,7 @@ void FunctionWriter::writeItem(const FlowItem& Item) {
 void FunctionWriter::writeAssignment(const FlowItem& Item) {
     const Variable& Target = *Item.pTarget;
     const Term* pValue = Item.pTerm;
-    if (pValue->IsStore) {
+    if (pValue->isStore()) {
         m_Expressions.writeElement(Target, pValue->pLeft);
         pValue = pValue->pRight;
     } else {

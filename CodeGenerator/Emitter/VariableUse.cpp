@@ -14,7 +14,7 @@ namespace {
 /// Shows each variable that a term reads; of an element store that is not the array.
 template <class Visit>
 void forEachRead(const Term* pTerm, Visit&& visit) {
-    if (pTerm->pVariable && !pTerm->IsStore)
+    if (pTerm->hasVariable() && !pTerm->isStore())
         visit(declarationOf(pTerm->pVariable));
     if (pTerm->pLeft)
         forEachRead(pTerm->pLeft, visit);
@@ -72,7 +72,7 @@ private:
 /// Whether it matters that a read is not written: of a variable that is declared only if it is
 /// read.
 bool readsOwn(const Term* pTerm) {
-    if (pTerm->pVariable) {
+    if (pTerm->hasVariable()) {
         const VariableKind Kind = declarationOf(pTerm->pVariable)->Kind;
         if (Kind == VariableKind::Local || Kind == VariableKind::Formal ||
             Kind == VariableKind::Param)
@@ -134,9 +134,9 @@ void VariableUse::add(int Function, const ProcedureFlow& Flow) {
         const bool IsAssigned = Item.Kind == FlowItemKind::Assign;
         if (Item.pTerm)
             addReads(Function, Item.pTerm, IsAssigned, [&](ExpressionWriter& Writer) {
-                if (Item.pTerm->IsStore)
+                if (Item.pTerm->isStore())
                     Writer.writeElement(*Item.pTarget, Item.pTerm->pLeft);
-                const Term* pValue = Item.pTerm->IsStore ? Item.pTerm->pRight : Item.pTerm;
+                const Term* pValue = Item.pTerm->isStore() ? Item.pTerm->pRight : Item.pTerm;
                 if (IsAssigned)
                     Writer.writeStored(pValue, *Item.pTarget->pType, true);
                 else

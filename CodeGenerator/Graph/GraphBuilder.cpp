@@ -143,7 +143,7 @@ ZfCCfgExpression* GraphBuilder::makeCondition(const SketchBlock& Block) {
     if (Block.pSelector != nullptr) {
         pTerm = m_Terms.makeBinary(Operator::Equal,
                                    m_Terms.makeVariable(variableOf(*Block.pSelector)), pTerm);
-        pTerm->Position = Block.pCondition->Position;
+        pTerm->setPosition(Block.pCondition->Position);
     }
     return makeExpression(pTerm);
 }
@@ -213,7 +213,7 @@ void GraphBuilder::buildAssignment(const Statement& Source, ZfCBasicBlock* pBloc
     if (Source.Kind == StatementKind::Assign && Source.CompoundOp != Operator::Number) {
         Term* pOld = m_Terms.makeVariable(variableOf(Target));
         pValue = m_Terms.makeBinary(Source.CompoundOp, pOld, pValue);
-        pValue->Position = Source.Position;
+        pValue->setPosition(Source.Position);
     }
     append(variableOf(Target), convert(Target.pType, pValue, Source.Position), Source.Position,
            pBlock);
@@ -236,7 +236,7 @@ void GraphBuilder::buildElementAssignment(const Statement& Source, ZfCBasicBlock
     if (IsCompound) {
         Term* pOld = makeElement(*Source.pTarget, makeIndex(), Source.Position);
         pValue = m_Terms.makeBinary(Source.CompoundOp, pOld, pValue);
-        pValue->Position = Source.Position;
+        pValue->setPosition(Source.Position);
     }
     appendStore(Source, makeIndex(), pValue, pBlock);
 }
@@ -245,7 +245,6 @@ void GraphBuilder::appendStore(const Statement& Source, Term* pIndex, Term* pVal
                                ZfCBasicBlock* pBlock) {
     const Variable& Array = *Source.pTarget;
     Term* pStore = makeElement(Array, pIndex, Source.Position);
-    pStore->IsStore = true;
     pStore->pRight = convert(Array.pType, pValue, Source.Position);
     append(variableOf(Array), pStore, Source.Position, pBlock);
 }
@@ -326,10 +325,12 @@ Term* GraphBuilder::makeTerm(const Expression* pSource) {
         return nullptr;
     Term* pTerm = m_Terms.make();
     pTerm->Op = pSource->Op;
-    pTerm->Position = pSource->Position;
-    pTerm->Number = pSource->Op == Operator::Number ? pSource->Number : 0.0;
-    pTerm->pType = pSource->Op == Operator::Cast ? pSource->pType : nullptr;
-    if (pSource->pVariable != nullptr)
+    pTerm->setPosition(pSource->Position);
+    if (pSource->Op == Operator::Number)
+        pTerm->Number = pSource->Number;
+    else if (pSource->Op == Operator::Cast)
+        pTerm->pType = pSource->pType;
+    else if (pTerm->hasVariable())
         pTerm->pVariable = variableOf(*pSource->pVariable);
     pTerm->pLeft = makeTerm(pSource->pLeft);
     pTerm->pRight = makeTerm(pSource->pRight);
@@ -339,13 +340,13 @@ Term* GraphBuilder::makeTerm(const Expression* pSource) {
 Term* GraphBuilder::makeElement(const Variable& Array, Term* pIndex, SourcePosition Position) {
     Term* pTerm = m_Terms.makeUnary(Operator::Element, pIndex);
     pTerm->pVariable = variableOf(Array);
-    pTerm->Position = Position;
+    pTerm->setPosition(Position);
     return pTerm;
 }
 
 Term* GraphBuilder::convert(const Type* pType, Term* pValue, SourcePosition Position) {
     Term* pTerm = m_Terms.makeCast(pType, pValue);
-    pTerm->Position = Position;
+    pTerm->setPosition(Position);
     return pTerm;
 }
 

@@ -242,7 +242,7 @@ ZfCCfgValue valueOfTerm(const Term* pTerm) {
 bool readsInput(const Term* pTerm) {
     if (pTerm == nullptr)
         return false;
-    if (pTerm->pVariable != nullptr && !pTerm->IsStore &&
+    if (pTerm->hasVariable() && !pTerm->isStore() &&
         originalOf(pTerm->pVariable)->isReadASideEffect())
         return true;
     return readsInput(pTerm->pLeft) || readsInput(pTerm->pRight);
@@ -251,13 +251,13 @@ bool readsInput(const Term* pTerm) {
 bool isSameTerm(const Term* a, const Term* b) {
     if (a == nullptr || b == nullptr)
         return a == b;
-    if (a->Op != b->Op || a->IsStore != b->IsStore || a->pType != b->pType)
+    if (a->Op != b->Op)
         return false;
-    if (std::memcmp(&a->Number, &b->Number, sizeof a->Number) != 0)
+    if (a->Op == Operator::Number)
+        return std::memcmp(&a->Number, &b->Number, sizeof a->Number) == 0;
+    if (a->Op == Operator::Cast && a->pType != b->pType)
         return false;
-    if ((a->pVariable == nullptr) != (b->pVariable == nullptr))
-        return false;
-    if (a->pVariable != nullptr && originalOf(a->pVariable) != originalOf(b->pVariable))
+    if (a->hasVariable() && originalOf(a->pVariable) != originalOf(b->pVariable))
         return false;
     return isSameTerm(a->pLeft, b->pLeft) && isSameTerm(a->pRight, b->pRight);
 }

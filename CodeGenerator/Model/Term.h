@@ -6,6 +6,7 @@
 #include "ZfCCfgValue.h"
 
 #include <cstddef>
+#include <cstdint>
 #include <memory>
 #include <vector>
 
@@ -21,18 +22,43 @@ namespace hpn {
 /// Meaning of an assignment's root, made by the graph builder: `Cast` to the type of the left-hand
 /// variable (or of its element). A store to an array element has the root `Element`-like form
 /// `Store`: pLeft the index, pRight the converted value.
+///
+/// Every pass walks all terms, and a program has about ten for each statement: two of them fill a
+/// cache line, which is why they share room where they can.
 struct Term {
     /// The operators of the syntax tree, and the store to an element that exists on the graph only.
     Operator Op = Operator::Number;
-    bool IsStore = false; ///< root of an element store: pLeft index, pRight value; Op is Element
-    SourcePosition Position;
+
+private:
+    std::uint8_t m_File[3] = {}; // low byte first
+    std::uint32_t m_Offset = 0;
+
+public:
+    /// One of them, by Op.
+    union {
+        double Number = 0.0;       ///< Number
+        ZfCCfgVariable* pVariable; ///< hasVariable()
+        const Type* pType;         ///< Cast
+    };
     Term* pLeft = nullptr;
     Term* pRight = nullptr;
-    double Number = 0.0; ///< Op Number
-    ZfCCfgVariable* pVariable =
-        nullptr;                 ///< Variable, Element (the array; of a store the array written)
-    const Type* pType = nullptr; ///< Cast
+
+    /// Variable, Element (the array; of a store the array written).
+    bool hasVariable() const { return Op == Operator::Variable || Op == Operator::Element; }
+    /// The root of an element store: pLeft the index, pRight the value.
+    bool isStore() const { return Op == Operator::Element && pRight != nullptr; }
+    /// The place in the source; files are numbered below 2^24.
+    SourcePosition getPosition() const {
+        return {m_File[0] | std::uint32_t{m_File[1]} << 8 | std::uint32_t{m_File[2]} << 16,
+                m_Offset};
+    }
+    void setPosition(SourcePosition Position) {
+        for (unsigned i = 0; i < 3; ++i)
+            m_File[i] = static_cast<std::uint8_t>(Position.File >> 8 * i);
+        m_Offset = Position.Offset;
+    }
 };
+static_assert(sizeof(void*) > 8 || sizeof(Term) <= 32, "two terms fill a cache line");
 
 /// Gives out terms; they go when the arena goes. One at a time in a process, like the graph that it
 /// serves.

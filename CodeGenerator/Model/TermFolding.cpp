@@ -22,10 +22,10 @@ namespace hpn {
 namespace {
 
 void becomeNumber(Term* pTerm, double Number) {
-    const SourcePosition Position = pTerm->Position;
+    const SourcePosition Position = pTerm->getPosition();
     *pTerm = Term();
     pTerm->Number = Number;
-    pTerm->Position = Position;
+    pTerm->setPosition(Position);
 }
 
 void becomeOperand(Term* pTerm, const Term* pOperand) {
@@ -56,7 +56,7 @@ bool isInt32(const ValueRange& Range) {
 const Type* directType(const Term* pTerm) {
     if (pTerm->Op == Operator::Cast)
         return pTerm->pType;
-    if (pTerm->pVariable != nullptr)
+    if (pTerm->hasVariable())
         return &originalOf(pTerm->pVariable)->getType();
     return nullptr;
 }
@@ -227,7 +227,7 @@ void foldUnary(Term* pTerm) {
 }
 
 void foldNode(Term* pTerm, bool IsRoot) {
-    if (pTerm->Op == Operator::Number || pTerm->pVariable != nullptr)
+    if (pTerm->Op == Operator::Number || pTerm->hasVariable())
         return;
     const ValueRange Range = typeRange(pTerm);
     if (Range.isSingle() && !readsInput(pTerm))
@@ -246,8 +246,7 @@ void foldOperands(Term* pTerm);
 
 /// A term of numbers alone has an exact result, NaN and negative zero included.
 bool foldNumbers(Term* pTerm) {
-    if (pTerm->pLeft == nullptr || pTerm->pVariable != nullptr ||
-        pTerm->pLeft->Op != Operator::Number)
+    if (pTerm->pLeft == nullptr || pTerm->hasVariable() || pTerm->pLeft->Op != Operator::Number)
         return false;
     if (pTerm->Op == Operator::Cast)
         becomeNumber(pTerm, convertNumber(pTerm->pLeft->Number, *pTerm->pType));
@@ -271,7 +270,7 @@ void foldSubterm(Term* pTerm, bool IsRoot) {
 void foldOperands(Term* pTerm) {
     // The value of a store is the root of its own: its conversion to the element's type stays.
     foldSubterm(pTerm->pLeft, false);
-    foldSubterm(pTerm->pRight, pTerm->IsStore);
+    foldSubterm(pTerm->pRight, pTerm->isStore());
 }
 
 } // namespace

@@ -13,30 +13,31 @@ using hpn::Term;
 
 namespace {
 
-void collectVariables(const Term* pTerm, leda::set<ZfCCfgVariable*, leda::avl_tree>& Variables) {
+/// Calls `take` for each read until it answers false; whether it never did.
+template <class Visitor>
+bool forEachRead(const Term* pTerm, const Visitor& take) {
     if (pTerm == nullptr)
-        return;
+        return true;
     // The array that a store writes is the left-hand side's business.
-    if (pTerm->pVariable != nullptr && !pTerm->IsStore)
-        Variables.insert(pTerm->pVariable);
-    collectVariables(pTerm->pLeft, Variables);
-    collectVariables(pTerm->pRight, Variables);
+    if (pTerm->hasVariable() && !pTerm->isStore() && !take(pTerm->pVariable))
+        return false;
+    return forEachRead(pTerm->pLeft, take) && forEachRead(pTerm->pRight, take);
 }
 
 void replaceRead(Term* pTerm, ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
     if (pTerm == nullptr)
         return;
-    if (pTerm->pVariable == pOld && !pTerm->IsStore)
+    if (pTerm->hasVariable() && pTerm->pVariable == pOld && !pTerm->isStore())
         pTerm->pVariable = pNew;
     replaceRead(pTerm->pLeft, pOld, pNew);
     replaceRead(pTerm->pRight, pOld, pNew);
 }
 
 void becomeNumber(Term* pTerm, double Number) {
-    const hpn::SourcePosition Position = pTerm->Position;
+    const hpn::SourcePosition Position = pTerm->getPosition();
     *pTerm = Term();
     pTerm->Number = Number;
-    pTerm->Position = Position;
+    pTerm->setPosition(Position);
 }
 
 void replaceConstantReads(Term* pTerm) {
@@ -44,7 +45,8 @@ void replaceConstantReads(Term* pTerm) {
         return;
     if (pTerm->Op == Operator::Variable) {
         const ZfCCfgValue& Value = pTerm->pVariable->getValue();
-        if (Value.isConstant() && hpn::mayRewrite("read replaced by a constant", pTerm->Position))
+        if (Value.isConstant() &&
+            hpn::mayRewrite("read replaced by a constant", pTerm->getPosition()))
             becomeNumber(pTerm, Value.getValue());
         return;
     }
@@ -101,9 +103,19 @@ public:
     const ZfCCfgValue& value() const { return m_Value; }
     const hpn::ValueRange& range() const { return m_Range; }
 
+    /// Of a term with so many reads that they are not at hand they are looked for.
     void remember(const Term* pRoot, const ZfCCfgValue& Value, const hpn::ValueRange& Range) {
         m_NumberOfReads = 0;
-        m_pRoot = noteReads(pRoot) ? pRoot : nullptr;
+        const auto take = [this](ZfCCfgVariable* pVariable) { return noteRead(pVariable); };
+        m_pRoot = forEachRead(pRoot, take) ? pRoot : nullptr;
+        m_Value = Value;
+        m_Range = Range;
+    }
+    void remember(const Term* pRoot, ZfCCfgVariable* const* pReads, std::size_t Number,
+                  const ZfCCfgValue& Value, const hpn::ValueRange& Range) {
+        m_NumberOfReads = 0;
+        std::for_each(pReads, pReads + Number, [this](ZfCCfgVariable* p) { noteRead(p); });
+        m_pRoot = pRoot;
         m_Value = Value;
         m_Range = Range;
     }
@@ -120,7 +132,7 @@ private:
         ZfCCfgValue Minimum;
         ZfCCfgValue Maximum;
     };
-    static constexpr int s_MostReads = 4; // terms with more are computed again
+    static constexpr int s_MostReads = 8; // terms with more are computed again
 
     static bool isSame(const ZfCCfgValue& a, const ZfCCfgValue& b) {
         return a.getValueKind() == b.getValueKind() &&
@@ -133,17 +145,12 @@ private:
                isSame(Of.Maximum, Of.pVariable->getMaxValue());
     }
 
-    bool noteReads(const Term* pTerm) {
-        if (pTerm == nullptr)
-            return true;
-        if (pTerm->pVariable != nullptr) {
-            if (m_NumberOfReads == s_MostReads)
-                return false;
-            ZfCCfgVariable* pVariable = pTerm->pVariable;
-            m_Reads[m_NumberOfReads++] = {pVariable, pVariable->getValue(),
-                                          pVariable->getMinValue(), pVariable->getMaxValue()};
-        }
-        return noteReads(pTerm->pLeft) && noteReads(pTerm->pRight);
+    bool noteRead(ZfCCfgVariable* pVariable) {
+        if (m_NumberOfReads == s_MostReads)
+            return false;
+        m_Reads[m_NumberOfReads++] = {pVariable, pVariable->getValue(), pVariable->getMinValue(),
+                                      pVariable->getMaxValue()};
+        return true;
     }
 
     const Term* m_pRoot = nullptr;
@@ -161,25 +168,52 @@ LastEvaluation s_LastEvaluation;
 // The arena may give out the term of an earlier program again.
 ZfCCfgSFExpression::ZfCCfgSFExpression(Term* pRoot) : m_pRoot(pRoot) {
     s_LastEvaluation.forget();
+    noteReads();
 }
 
 ZfCCfgSFExpression::~ZfCCfgSFExpression() = default;
 
 leda::set<ZfCCfgVariable*, leda::avl_tree> ZfCCfgSFExpression::getUsedVariables() {
     leda::set<ZfCCfgVariable*, leda::avl_tree> Variables;
-    collectVariables(m_pRoot, Variables);
+    const auto take = [&Variables](ZfCCfgVariable* pVariable) {
+        Variables.insert(pVariable);
+        return true;
+    };
+    if (m_NumberOfReads == s_ManyReads)
+        forEachRead(m_pRoot, take);
+    else
+        std::for_each(m_Reads, m_Reads + m_NumberOfReads, take);
     return Variables;
+}
+
+void ZfCCfgSFExpression::noteReads() {
+    m_NumberOfReads = 0;
+    const auto take = [this](ZfCCfgVariable* pVariable) {
+        ZfCCfgVariable** pEnd = m_Reads + m_NumberOfReads;
+        if (std::find(m_Reads, pEnd, pVariable) != pEnd)
+            return true;
+        if (m_NumberOfReads == s_MostReads)
+            return false;
+        m_Reads[m_NumberOfReads++] = pVariable;
+        return true;
+    };
+    if (!forEachRead(m_pRoot, take))
+        m_NumberOfReads = s_ManyReads;
 }
 
 void ZfCCfgSFExpression::replaceVariable(ZfCCfgVariable* pOld, ZfCCfgVariable* pNew) {
     s_LastEvaluation.forget();
     replaceRead(m_pRoot, pOld, pNew);
+    // Where the new one was read before it stands here twice now, which harms nobody.
+    if (m_NumberOfReads != s_ManyReads)
+        std::replace(m_Reads, m_Reads + m_NumberOfReads, pOld, pNew);
     m_IsSettled = false;
 }
 
 void ZfCCfgSFExpression::replaceConditionWithConstant(double Number) {
     s_LastEvaluation.forget();
     becomeNumber(m_pRoot, Number);
+    m_NumberOfReads = 0;
     m_IsSettled = false;
 }
 
@@ -195,8 +229,7 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
     if (!Value.isConstant() && m_pRoot->Op != Operator::Element) {
         // An undetermined operand counts with all that its type can hold, so a single number holds
         // whatever it becomes.
-        const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
-        s_LastEvaluation.remember(m_pRoot, Value, Range);
+        const hpn::ValueRange Range = evaluateRange(Value);
         if (Range.isSingle())
             Value = ZfCCfgValue(Range.Low);
     }
@@ -205,7 +238,7 @@ ZfCCfgValue ZfCCfgSFExpression::evaluate() {
     if (Value.isConstant() && std::isnan(Value.getValue()))
         return ZfCCfgValue(eCfgValueNonConstant);
     if (Value.isConstant()) {
-        if (pBudget != nullptr && !pBudget->maySettle(this, m_pRoot->Position))
+        if (pBudget != nullptr && !pBudget->maySettle(this, m_pRoot->getPosition()))
             return ZfCCfgValue(eCfgValueNonConstant);
         m_IsSettled = true;
         m_SettledNumber = Value.getValue();
@@ -225,6 +258,16 @@ ZfCCfgValue ZfCCfgSFExpression::getEndOfNumber(double Number) {
     return std::isnan(Number) ? ZfCCfgValue(eCfgValueNonConstant) : ZfCCfgValue(Number);
 }
 
+/// Remembers it with the value for the questions that follow.
+hpn::ValueRange ZfCCfgSFExpression::evaluateRange(const ZfCCfgValue& Value) {
+    const hpn::ValueRange Range = hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation);
+    if (m_NumberOfReads == s_ManyReads)
+        s_LastEvaluation.remember(m_pRoot, Value, Range);
+    else
+        s_LastEvaluation.remember(m_pRoot, m_Reads, m_NumberOfReads, Value, Range);
+    return Range;
+}
+
 ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
     if (isMarkedAsEvalToNonConst() || m_pRoot->Op == Operator::Element)
         return ZfCCfgValue(eCfgValueNonConstant);
@@ -234,8 +277,7 @@ ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
         const ZfCCfgValue Value = hpn::latticeValueOfTerm(m_pRoot);
         if (Value.isConstant())
             return getEndOfNumber(Value.getValue());
-        s_LastEvaluation.remember(m_pRoot, Value,
-                                  hpn::rangeOfTerm(m_pRoot, hpn::RangeSource::Propagation));
+        evaluateRange(Value);
     }
     const ZfCCfgValue Value = s_LastEvaluation.value();
     const hpn::ValueRange& Range = s_LastEvaluation.range();
@@ -246,9 +288,18 @@ ZfCCfgValue ZfCCfgSFExpression::getEnd(bool IsMaximum) {
     return ZfCCfgValue(IsMaximum ? Range.High : Range.Low);
 }
 
+bool ZfCCfgSFExpression::mayReadConstant() const {
+    return m_NumberOfReads == s_ManyReads ||
+           std::any_of(m_Reads, m_Reads + m_NumberOfReads,
+                       [](ZfCCfgVariable* p) { return p->getValue().isConstant(); });
+}
+
 void ZfCCfgSFExpression::replaceConstantVariables() {
+    if (!mayReadConstant())
+        return;
     s_LastEvaluation.forget();
     replaceConstantReads(m_pRoot);
+    noteReads();
 }
 
 void ZfCCfgSFExpression::replaceConstantCondition() {
@@ -257,9 +308,10 @@ void ZfCCfgSFExpression::replaceConstantCondition() {
         return;
     ZfCCfgValue Value = evaluate();
     if (Value.isConstant() && m_pRoot->Op != Operator::Number &&
-        hpn::mayRewrite("condition replaced by its value", m_pRoot->Position)) {
+        hpn::mayRewrite("condition replaced by its value", m_pRoot->getPosition())) {
         s_LastEvaluation.forget();
         becomeNumber(m_pRoot, Value.getValue());
+        m_NumberOfReads = 0;
     }
 }
 
@@ -271,15 +323,18 @@ void ZfCCfgSFExpression::foldConstants() {
         Term* pFolded = pArena->copy(m_pRoot);
         hpn::foldTerm(pFolded);
         if (hpn::isSameTerm(pFolded, m_pRoot) ||
-            !hpn::mayRewrite("expression folded", m_pRoot->Position))
+            !hpn::mayRewrite("expression folded", m_pRoot->getPosition()))
             return;
     }
     hpn::foldTerm(m_pRoot);
+    if (m_NumberOfReads > 0)
+        noteReads();
 }
 
 ZfCCfgVariable* ZfCCfgSFExpression::isVariable(bool& Negated) {
     ZfCCfgVariable* pVariable = offeredVariable(stripNegations(m_pRoot, Negated));
-    if (pVariable != nullptr && !hpn::mayRewrite("note taken from a branch", m_pRoot->Position))
+    if (pVariable != nullptr &&
+        !hpn::mayRewrite("note taken from a branch", m_pRoot->getPosition()))
         return nullptr;
     return pVariable;
 }
@@ -296,7 +351,7 @@ bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, Z
     ZfCCfgVariable* pRead = offeredVariable(pLeft);
     if (pRead == nullptr || pRight->Op != Operator::Number ||
         !isTellingConstant(pRead, pRight->Number) ||
-        !hpn::mayRewrite("note taken from a branch", m_pRoot->Position))
+        !hpn::mayRewrite("note taken from a branch", m_pRoot->getPosition()))
         return false;
     pVariable = pRead;
     Value = ZfCCfgValue(pRight->Number);
@@ -305,7 +360,10 @@ bool ZfCCfgSFExpression::isVariableEqualToConstant(ZfCCfgVariable*& pVariable, Z
 }
 
 bool ZfCCfgSFExpression::hasSideEffects() {
-    return hpn::readsInput(m_pRoot);
+    if (m_NumberOfReads == s_ManyReads)
+        return hpn::readsInput(m_pRoot);
+    return std::any_of(m_Reads, m_Reads + m_NumberOfReads,
+                       [](ZfCCfgVariable* p) { return hpn::originalOf(p)->isReadASideEffect(); });
 }
 
 ZfCCfgSFExpression* ZfCCfgSFExpression::isSFExpression() {
@@ -314,5 +372,6 @@ ZfCCfgSFExpression* ZfCCfgSFExpression::isSFExpression() {
 
 void ZfCCfgSFExpression::actOnComparisonOutsideBoolRange() {
     hpn::pendingWarnings().push_back(
-        {m_pRoot->Position, "a Boolean variable is compared with a number other than 0 and 1"});
+        {m_pRoot->getPosition(),
+         "a Boolean variable is compared with a number other than 0 and 1"});
 }

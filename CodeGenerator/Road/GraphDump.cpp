@@ -106,7 +106,7 @@ void openTerm(const Term* pTerm, std::vector<Piece>& Stack, std::ostream& Stream
     case Operator::Element:
         writeVariable(pTerm->pVariable, Stream);
         Stream << '[';
-        if (pTerm->IsStore) {
+        if (pTerm->isStore()) {
             later(pTerm->pRight);
             laterText("] = ");
         } else {

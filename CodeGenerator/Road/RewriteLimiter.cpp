@@ -109,7 +109,7 @@ SourcePosition positionOf(ZfCCfgStatement* pStatement) {
     ZfCCfgAssignment* pAssignment = pStatement->isAssignment();
     ZfCCfgSFExpression* pRight =
         pAssignment != nullptr ? pAssignment->getRHS()->isSFExpression() : nullptr;
-    return pRight != nullptr ? pRight->getRoot()->Position : SourcePosition{};
+    return pRight != nullptr ? pRight->getRoot()->getPosition() : SourcePosition{};
 }
 
 } // namespace

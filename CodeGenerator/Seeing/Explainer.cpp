@@ -641,7 +641,7 @@ private:
         if (pRight == nullptr || pStatement->getIsVirtual())
             return;
         const Term* pRoot =
-            pRight->getRoot()->IsStore ? pRight->getRoot()->pRight : pRight->getRoot();
+            pRight->getRoot()->isStore() ? pRight->getRoot()->pRight : pRight->getRoot();
         const Type& Of = originalOf(pAssignment->getLHS())->getType();
         if (!Of.SaturatesLow && !Of.SaturatesHigh)
             return;

@@ -222,7 +222,7 @@ RecordedPlace StateReader::placeOf(SourcePosition Position) const {
 
 RecordedPlace StateReader::placeOf(ZfCCfgExpression* pExpression) const {
     ZfCCfgSFExpression* pOwn = pExpression != nullptr ? pExpression->isSFExpression() : nullptr;
-    return pOwn != nullptr ? placeOf(pOwn->getRoot()->Position) : RecordedPlace{};
+    return pOwn != nullptr ? placeOf(pOwn->getRoot()->getPosition()) : RecordedPlace{};
 }
 
 RecordedPlace StateReader::placeOfCall(ZfCCfgStatement* pCall) const {
@@ -438,7 +438,7 @@ void StateReader::describeAssignment(ZfCCfgStatement* pStatement, leda::node v,
     ZfCCfgAssignment* pAssignment = pStatement->isAssignment();
     ZfCCfgSFExpression* pOwn = pAssignment->getRHS()->isSFExpression();
     State.MakesCode = !pStatement->getIsVirtual();
-    const bool IsStore = pOwn != nullptr && pOwn->getRoot()->IsStore;
+    const bool IsStore = pOwn != nullptr && pOwn->getRoot()->isStore();
     if (!IsStore) {
         appendName(pAssignment->getLHS(), State.Text);
         State.Text += " = ";
@@ -457,7 +457,7 @@ void StateReader::describeAssignment(ZfCCfgStatement* pStatement, leda::node v,
         State.Place = placeOfBranchAbove(v);
     } else if (pOwn != nullptr) {
         State.Form = RecordedForm::Argument;
-        State.Place = placeOf(pOwn->getRoot()->Position);
+        State.Place = placeOf(pOwn->getRoot()->getPosition());
     } else {
         State.Form = RecordedForm::InitialValue;
         State.MakesCode = false; // written by the init function
@@ -555,8 +555,8 @@ void StateReader::addReads(ZfCCfgExpression* pExpression, RecordedPlace Otherwis
 void StateReader::addReads(const Term* pTerm, RecordedStatement& State) {
     if (pTerm == nullptr)
         return;
-    if (pTerm->pVariable != nullptr && !pTerm->IsStore)
-        addRead(pTerm->pVariable, placeOf(pTerm->Position), State);
+    if (pTerm->hasVariable() && !pTerm->isStore())
+        addRead(pTerm->pVariable, placeOf(pTerm->getPosition()), State);
     addReads(pTerm->pLeft, State);
     addReads(pTerm->pRight, State);
 }

@@ -81,7 +81,7 @@ private:
         m_Out += '[';
         write(pTerm->pLeft, 0);
         m_Out += ']';
-        if (!pTerm->IsStore)
+        if (!pTerm->isStore())
             return;
         m_Out += " = ";
         appendStored(pTerm->pRight, *originalOf(pTerm->pVariable)->getDeclaration().pType, m_Names,

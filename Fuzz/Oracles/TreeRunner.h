@@ -249,8 +249,8 @@ private:
         if (pOwn == nullptr)
             return; // an initial value
         const Term* pRoot = pOwn->getRoot();
-        const double Index = pRoot->IsStore ? evaluate(pRoot->pLeft, m_In) : 0.0;
-        m_In.store(Target, Index, evaluate(pRoot->IsStore ? pRoot->pRight : pRoot, m_In));
+        const double Index = pRoot->isStore() ? evaluate(pRoot->pLeft, m_In) : 0.0;
+        m_In.store(Target, Index, evaluate(pRoot->isStore() ? pRoot->pRight : pRoot, m_In));
     }
 
     ZfCControlFlowGraph& m_Graph;
