@@ -124,6 +124,12 @@ private:
     static void copy(T* to, const T* from, int n) {
         std::memcpy(static_cast<void*>(to), from, std::size_t(n) * sizeof(T));
     }
+    // Copies between arrays that have a multiple of inline_slots, so many at a time: moves of a
+    // fixed size need no call.
+    static void copy_blocks(T* to, const T* from, int n) {
+        for (int i = 0; i < n; i += inline_slots)
+            std::memcpy(static_cast<void*>(to + i), from + i, inline_slots * sizeof(T));
+    }
     static int capacity_for(int n);
 
     bool find_flat(const T& x, int& slot) const;
@@ -480,21 +486,18 @@ void set<T, Impl>::release() {
         pool_delete(m_chunks);
 }
 
-// Takes m_size elements from another set's array. It has a multiple of inline_slots, as the new
-// storage has, and is copied by so many at a time: moves of a fixed size need no call.
+// Takes m_size elements from another set's array.
 template <class T, class Impl>
 void set<T, Impl>::copy_array(const T* from) {
     if (m_size > inline_slots) {
         m_capacity = capacity_for(m_size);
         m_array = pool_allocate_array<T>(std::size_t(m_capacity));
     }
-    T* to = data();
-    for (int i = 0; i < m_size; i += inline_slots)
-        std::memcpy(static_cast<void*>(to + i), from + i, inline_slots * sizeof(T));
+    copy_blocks(data(), from, m_size);
 }
 
-// Makes the elements those of a sorted array outside this set; the present storage is inline or an
-// array.
+// Makes the elements those of a sorted array outside this set that has a multiple of inline_slots;
+// the present storage is inline or an array.
 template <class T, class Impl>
 void set<T, Impl>::assign_sorted(const T* first, int n) {
     if (n > m_capacity) {
@@ -502,7 +505,7 @@ void set<T, Impl>::assign_sorted(const T* first, int n) {
         m_capacity = capacity_for(n);
         m_array = pool_allocate_array<T>(std::size_t(m_capacity));
     }
-    copy(data(), first, n);
+    copy_blocks(data(), first, n);
     m_size = n;
 }
 
@@ -529,7 +532,11 @@ void set<T, Impl>::merge_flat(const set& other) {
     T merged[2 * flat_slots];
     const int n =
         sorted_arrays::unite<T, flat_slots>(a + from, to - from, b + from, b_to - from, merged);
-    if (n != to - from)
+    if (n == to - from)
+        return;
+    if (to - from == m_size && n <= flat_slots)
+        assign_sorted(merged, n);
+    else
         replace(from, to, merged, n);
 }
 
@@ -594,8 +601,14 @@ void set<T, Impl>::merge_chunks(const set& other) {
             as = sorted_arrays::lower_bound(a.m_current, as, b_last);
             as += order(a.m_current[as], b_last) == 0;
         }
-        merged->append(
-            block, sorted_arrays::unite<T, flat_slots>(a.m_current, as, b.m_current, bs, block));
+        if (bs == 0 ||
+            (as == bs && std::memcmp(a.m_current, b.m_current, std::size_t(as) * sizeof(T)) == 0))
+            merged->append(a.m_current, as);
+        else if (as == 0)
+            merged->append(b.m_current, bs);
+        else
+            merged->append(block, sorted_arrays::unite<T, flat_slots>(a.m_current, as, b.m_current,
+                                                                      bs, block));
         a.skip(as);
         b.skip(bs);
     }

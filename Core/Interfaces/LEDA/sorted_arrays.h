@@ -6,6 +6,7 @@
 #include <cstddef>
 #include <cstdint>
 #include <cstring>
+#include <limits>
 #include <type_traits>
 
 namespace leda {
@@ -87,45 +88,94 @@ int lower_bound(const T* elements, int n, const T& x) {
     return low;
 }
 
-// Union of two arrays, of limit elements at most each: writes it to the front of a buffer with room
-// for as + bs elements and answers its size. Of equal elements that of a is taken.
-//
-// Both ends are merged at once as long as both sides have two elements left: the two steps of a
-// round do not wait for each other.
+// A short array with its numbers, read once, and at either end a number that stops a merge there.
+template <class T, int limit>
+class numbered_array {
+public:
+    // An element and its number.
+    struct entry {
+        // What order_number says.
+        std::int64_t number;
+        // The element.
+        T element;
+    };
+
+    // Reads n elements, limit at most.
+    numbered_array(const T* elements, int n) : m_last(m_entries + n) {
+        for (int i = 0; i < n; ++i)
+            m_entries[i + 1] = {order_number<T>::of(elements[i]), elements[i]};
+        m_entries[0].number = std::numeric_limits<std::int64_t>::min();
+        m_entries[n + 1].number = std::numeric_limits<std::int64_t>::max();
+    }
+    // The ends, for merges that move them towards each other.
+    const entry* first() const { return m_entries + 1; }
+    const entry* last() const { return m_last; }
+
+private:
+    entry m_entries[limit + 2];
+    const entry* m_last;
+};
+
+// unite by numbers, for arrays that are not empty. The elements of both stand in one order, equal
+// ones of a in front of those of b; its first half is merged from the front and the other from
+// behind. Neither waits for the other, and the number of steps is known before, so that the
+// processor has nothing to guess: an equal element takes a step too, but no place. Of an odd number
+// the one in the middle is taken by both, as if there were two of it.
+template <class T, int limit>
+int unite_numbered(const T* a, int as, const T* b, int bs, T* merged) {
+    using array = numbered_array<T, limit>;
+    using entry = typename array::entry;
+    const array of_a(a, as), of_b(b, bs);
+    const entry *a_low = of_a.first(), *a_high = of_a.last();
+    const entry *b_low = of_b.first(), *b_high = of_b.last();
+    T* low = merged;
+    T* const end = merged + as + bs;
+    T* high = end;
+    // The numbers taken last; none at first.
+    std::int64_t at_low = ~(a_low->number < b_low->number ? a_low : b_low)->number;
+    std::int64_t at_high = ~(a_high->number > b_high->number ? a_high : b_high)->number;
+    for (int steps = (as + bs + 1) / 2; steps > 0; --steps) {
+        const std::size_t from_a = order_detail::number(a_low->number <= b_low->number);
+        const entry* const first = from_a ? a_low : b_low;
+        a_low += from_a;
+        b_low += 1 - from_a;
+        *low = first->element; // the next is written over it if it equals the one before
+        low += first->number != at_low;
+        at_low = first->number;
+        const std::size_t from_b = order_detail::number(a_high->number <= b_high->number);
+        const entry* const last = from_b ? b_high : a_high;
+        b_high -= from_b;
+        a_high -= 1 - from_b;
+        high -= last->number != at_high; // if not, it is a's and written over that of b
+        at_high = last->number;
+        *high = last->element;
+    }
+    high += at_low == at_high;
+    const int rest = int(end - high);
+    if (low != high)
+        std::memmove(static_cast<void*>(low), high, std::size_t(rest) * sizeof(T));
+    return int(low - merged) + rest;
+}
+
+// Union of two arrays, of limit elements at most each and not empty: writes it to the front of a
+// buffer with room for as + bs elements and answers its size. Of equal elements that of a is taken.
 template <class T, int limit>
 int unite(const T* a, int as, const T* b, int bs, T* merged) {
-    const short_order<T, limit> order(a, as, b, bs);
-    std::ptrdiff_t i = 0, j = 0, i_end = as, j_end = bs;
-    T* low = merged;
-    T* const high_end = merged + as + bs;
-    T* high = high_end;
-    while (i_end - i >= 2 && j_end - j >= 2) {
-        const int at_low = order(i, j);
-        const int at_high = order(i_end - 1, j_end - 1);
-        const T* const firsts[2] = {b + j, a + i};
-        const T* const lasts[2] = {b + j_end - 1, a + i_end - 1};
-        const std::size_t low_from_a = order_detail::number(at_low <= 0);
-        const std::size_t high_from_a = order_detail::number(at_high >= 0);
-        *low++ = *firsts[low_from_a];
-        *--high = *lasts[high_from_a];
-        i += std::ptrdiff_t(low_from_a);
-        j += at_low >= 0;
-        i_end -= std::ptrdiff_t(high_from_a);
-        j_end -= at_high <= 0;
+    if constexpr (order_number<T>::known)
+        return unite_numbered<T, limit>(a, as, b, bs, merged);
+    T* end = merged;
+    int i = 0, j = 0;
+    while (i != as && j != bs) {
+        const int sign = key_order<T>(a[i], b[j]);
+        *end++ = sign <= 0 ? a[i] : b[j];
+        i += sign <= 0;
+        j += sign >= 0;
     }
-    while (i != i_end && j != j_end) {
-        const int at_low = order(i, j);
-        *low++ = at_low <= 0 ? a[i] : b[j];
-        i += at_low <= 0;
-        j += at_low >= 0;
-    }
-    while (i != i_end)
-        *low++ = a[i++];
-    while (j != j_end)
-        *low++ = b[j++];
-    if (low != high) // there were equal ones
-        std::memmove(static_cast<void*>(low), high, std::size_t(high_end - high) * sizeof(T));
-    return int(low - merged) + int(high_end - high);
+    while (i != as)
+        *end++ = a[i++];
+    while (j != bs)
+        *end++ = b[j++];
+    return int(end - merged);
 }
 
 // Keeps the elements of a that b has too, in place, and answers their number; limit elements at
