@@ -30,6 +30,7 @@
 #include "ZfCControlFlowGraph.h"
 
 #include "ZfCInternalCheck.h"
+#include "ZfCPrefetch.h"
 #include "ZfCPropagationState.h"
 
 void ZfCControlFlowGraph::propagateSparseConditionalConstant(bool RemoveDeadCode) {
@@ -55,32 +56,48 @@ void ZfCControlFlowGraph::buildVarUses() {
                 [](ZfCCfgVariable* pVariable) { pVariable->clearUses(); });
         }
     }
-    // Step 2.
+    // Step 2. Variables lie far apart, so their uses are entered in batches.
+    struct Use {
+        ZfCCfgVariable* pVariable;
+        leda::node Node;
+    };
+    auto Uses = makeBatch<Use>([](Use const& Item) { prefetch(&Item.pVariable->showUses()); },
+                               [](Use const& Item) { Item.pVariable->appendUse(Item.Node); });
     for (leda::node v = first_node(); v != stop_node(); v = next_node(v)) {
         if (ZfCBasicBlock* pBlock = inf(v)->isBasicBlock()) {
-            pBlock->forEachUsedVariable(
-                [v](ZfCCfgVariable* pVariable) { pVariable->appendUse(v); });
+            pBlock->forEachUsedVariable([&Uses, v](ZfCCfgVariable* pVariable) {
+                Uses.append({pVariable, v});
+            });
         }
     }
 }
 
 void ZfCControlFlowGraph::addSSAEdges() {
-    ZfCCfgFactory* pFactory = ZfCCfgFactory::getInstance();
     // Step 1.
     buildVarUses();
-    // Step 2.
+    // Step 2. Users lie far apart, so the edges are made in batches.
+    struct Pair {
+        leda::node DefiningNode;
+        leda::node UsingNode;
+    };
+    ZfCCfgFactory* pFactory = ZfCCfgFactory::getInstance();
+    auto Pairs =
+        makeBatch<Pair>([](Pair const& Item) { prefetch(Item.UsingNode); },
+                        [this, pFactory](Pair const& Item) {
+                            new_edge(Item.DefiningNode, Item.UsingNode, pFactory->createSSAEdge());
+                            if (m_pPropagation != nullptr) {
+                                m_pPropagation->addUser(Item.DefiningNode, Item.UsingNode);
+                            }
+                        });
     for (leda::node DefiningNode = first_node(); DefiningNode != stop_node();
          DefiningNode = next_node(DefiningNode)) {
         ZfCBasicBlock* pBlock = inf(DefiningNode)->isBasicBlock();
         if (pBlock == nullptr) {
             continue;
         }
-        pBlock->forEachAssignedVariable([&](ZfCCfgVariable* pVariable) {
+        pBlock->forEachAssignedVariable([&Pairs, DefiningNode](ZfCCfgVariable* pVariable) {
             for (leda::node UsingNode : pVariable->showUses()) {
-                new_edge(DefiningNode, UsingNode, pFactory->createSSAEdge());
-                if (m_pPropagation != nullptr) {
-                    m_pPropagation->addUser(DefiningNode, UsingNode);
-                }
+                Pairs.append({DefiningNode, UsingNode});
             }
         });
     }

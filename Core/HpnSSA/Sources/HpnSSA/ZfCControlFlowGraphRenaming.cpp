@@ -20,6 +20,7 @@
 #include "ZfCControlFlowGraph.h"
 
 #include "ZfCInternalCheck.h"
+#include "ZfCPrefetch.h"
 
 namespace {
 
@@ -234,18 +235,24 @@ void NodeRenamer::renameAlongEdge(leda::edge e) {
     }
 }
 
+// The variables of a join lie far apart.
 void NodeRenamer::renamePhiOperands(ZfCBasicBlock* pBasicBlock, int Index) {
+    auto Operands = makeBatch<ZfCPhiFunction*>(
+        [](ZfCPhiFunction* pPhiFunc) { prefetch(pPhiFunc->getVariable()); },
+        [Index](ZfCPhiFunction* pPhiFunc) {
+            // At a loop head the phi function has been renamed already.
+            ZfCCfgVariable* pVar = pPhiFunc->getVariable();
+            if (ZfCSSAVariable* pSSAVar = pVar->isSSAVariable()) {
+                pVar = pSSAVar->getOrigVar();
+            }
+            ZfCCfgVariable* pTop = pVar->topSSAReplacement();
+            if (pTop == nullptr) {
+                reportInternalError("ZfCControlFlowGraph", __LINE__);
+            }
+            pPhiFunc->setReplacementVariable(Index, pTop);
+        });
     for (ZfCPhiFunction* pPhiFunc : pBasicBlock->getPhiFunctions()) {
-        // At a loop head the phi function has been renamed already.
-        ZfCCfgVariable* pVar = pPhiFunc->getVariable();
-        if (ZfCSSAVariable* pSSAVar = pVar->isSSAVariable()) {
-            pVar = pSSAVar->getOrigVar();
-        }
-        ZfCCfgVariable* pTop = pVar->topSSAReplacement();
-        if (pTop == nullptr) {
-            reportInternalError("ZfCControlFlowGraph", __LINE__);
-        }
-        pPhiFunc->setReplacementVariable(Index, pTop);
+        Operands.append(pPhiFunc);
     }
 }
 
