@@ -97,6 +97,47 @@ ZfCCfgStatement* onlyStatement(ZfCBasicBlock* pBlock) {
     return pStmt != nullptr ? pStmt : pBlock->isStatement();
 }
 
+// Nodes by the debug index of the variable that they define. The versions of one graph are mostly
+// numbered in a row, so most entries stand in an array, which is no greater than some multiple of
+// what is in it; a process that has made many graphs has indices anywhere.
+class DefiningNodes {
+public:
+    void remember(int Number, leda::node v) {
+        if (m_Near.size() == 0) {
+            m_First = Number;
+            m_Near.resize(s_Room);
+        }
+        ++m_Count;
+        const int Place = Number - m_First;
+        if (Place >= m_Near.size() && Place < s_Room * m_Count) {
+            m_Near.resize(2 * Place);
+        }
+        if (isNear(Place)) {
+            m_Near[Place] = v;
+        } else {
+            m_Far[Number] = v;
+        }
+    }
+    // The node that was remembered last; null if there is none.
+    leda::node lookup(int Number) const {
+        if (isNear(Number - m_First) && m_Near[Number - m_First] != nullptr) {
+            return m_Near[Number - m_First];
+        }
+        leda::node const* pNode = m_Far.lookup(Number);
+        return pNode != nullptr ? *pNode : nullptr;
+    }
+
+private:
+    static constexpr int s_Room = 16;
+
+    bool isNear(int Place) const { return Place >= 0 && Place < m_Near.size(); }
+
+    leda::array<leda::node> m_Near; // by distance to the first number
+    leda::map<int, leda::node> m_Far;
+    int m_First = 0;
+    int m_Count = 0;
+};
+
 // The sweeps of removeUnusedVarDefs. Sets of nodes are in node order.
 class UnusedDefinitionSweeper {
 public:
@@ -114,7 +155,7 @@ private:
     void lookAgainAt(ZfCCfgVariable* pVariable, leda::node Current);
 
     CfgGraph& m_Graph;
-    leda::map<int, leda::node> m_DefiningNode; // by debug index: candidates that still had uses
+    DefiningNodes m_DefiningNodes;                     // candidates that still had uses
     leda::set<leda::node, leda::avl_tree> m_ThisSweep; // behind the current node
     leda::set<leda::node, leda::avl_tree> m_NextSweep; // at or before it
 };
@@ -161,9 +202,10 @@ bool UnusedDefinitionSweeper::isUnused(ZfCCfgVariable* pVariable, ZfCCfgStatemen
 }
 
 void UnusedDefinitionSweeper::remember(ZfCCfgVariable* pVariable, leda::node v) {
-    if (pVariable->isErasable() && !pVariable->isArray()) {
-        m_DefiningNode[pVariable->getDebugIndex()] = v;
+    if (!pVariable->isErasable() || pVariable->isArray()) {
+        return;
     }
+    m_DefiningNodes.remember(pVariable->getDebugIndex(), v);
 }
 
 // The last use of the variable went at Current. A virtual alias keeps its real variable alive, so
@@ -171,14 +213,14 @@ void UnusedDefinitionSweeper::remember(ZfCCfgVariable* pVariable, leda::node v) 
 // sweep will come to it.
 void UnusedDefinitionSweeper::lookAgainAt(ZfCCfgVariable* pVariable, leda::node Current) {
     for (ZfCCfgVariable* pCandidate : {pVariable, pVariable->getNonVirtualAlias()}) {
-        leda::node const* pNode = m_DefiningNode.lookup(pCandidate->getDebugIndex());
-        if (pNode == nullptr) {
+        leda::node const Node = m_DefiningNodes.lookup(pCandidate->getDebugIndex());
+        if (Node == nullptr) {
             continue;
         }
-        if (m_Graph.index(*pNode) > m_Graph.index(Current)) {
-            m_ThisSweep.insert(*pNode);
+        if (m_Graph.index(Node) > m_Graph.index(Current)) {
+            m_ThisSweep.insert(Node);
         } else {
-            m_NextSweep.insert(*pNode);
+            m_NextSweep.insert(Node);
         }
     }
 }
