@@ -10,7 +10,7 @@ void ZfCWorkList::grow() {
     for (int i = 0; i < m_Size; ++i) {
         Ring[i] = m_Ring[(m_First + i) & (OldSize - 1)];
     }
-    m_Ring.swap(Ring);
+    m_Ring = Ring;
     m_First = 0;
 }
 
