@@ -230,8 +230,27 @@ double convertNumber(double Number, const Type& To) {
     return convertInStorage(Number, To);
 }
 
+/// The common case: numbers that an integer type without scaling holds all, fractions aside, so
+/// that nothing clips and nothing wraps.
+static bool convertHeldRange(const ValueRange& From, const Type& To, ValueRange& Result) {
+    if (isFloating(To.Base) || To.Base == BaseType::Bool || isScaled(To) || From.MayBeNaN ||
+        From.isEmpty() || (To.SaturatesHigh && From.High > To.Upper) ||
+        (To.SaturatesLow && From.Low < To.Lower))
+        return false;
+    const auto Smallest = static_cast<double>(smallestRaw(To.Base));
+    const auto Greatest = static_cast<double>(greatestRaw(To.Base));
+    if (From.Low < Smallest || From.High > Greatest)
+        return false;
+    Result = interval(static_cast<double>(static_cast<std::int64_t>(From.Low)),
+                      static_cast<double>(static_cast<std::int64_t>(From.High)), true);
+    return true;
+}
+
 ValueRange convertRange(const ValueRange& From, const Type& To) {
-    ValueRange Result = emptyRange();
+    ValueRange Result;
+    if (convertHeldRange(From, To, Result))
+        return Result;
+    Result = emptyRange();
     ValueRange Rest = From;
     if (To.SaturatesHigh && !Rest.isEmpty() && Rest.High > To.Upper) {
         Result = hull(Result, rangeOfNumber(To.Upper + 0.0));

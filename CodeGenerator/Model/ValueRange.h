@@ -26,6 +26,8 @@ struct ValueRange {
     double Least = 0.0;
 
     bool isEmpty() const { return Low > High; }
+    /// Nothing is known of the numbers between the ends but that they may be whole.
+    bool isPlain() const { return Step == 0.0 && Least == 0.0; }
     /// One number and nothing else: not a NaN, and of one sign if it is zero.
     bool isSingle() const { return Low == High && !MayBeNaN && !MayBeNegativeZero; }
     bool contains(double Number) const;
