@@ -37,7 +37,10 @@ constexpr double Smallest = std::numeric_limits<double>::denorm_min();
 constexpr double Greatest = std::numeric_limits<double>::max();
 
 bool isWhole(double Number) {
-    return std::trunc(Number) == Number && std::fabs(Number) < Infinity;
+    const double Magnitude = std::fabs(Number);
+    if (Magnitude < 9007199254740992.0)
+        return static_cast<double>(static_cast<std::int64_t>(Number)) == Number;
+    return Magnitude < Infinity; // no double beyond 2^53 has a fraction
 }
 
 bool isNegativeZero(double Number) {
@@ -741,18 +744,9 @@ ValueRange rangeOfAnything() {
     return Result;
 }
 
-ValueRange hull(const ValueRange& a, const ValueRange& b) {
-    ValueRange Result;
-    Result.Low = std::min(a.Low, b.Low);
-    Result.High = std::max(a.High, b.High);
-    Result.MayBeNaN = a.MayBeNaN || b.MayBeNaN;
-    Result.MayBeNegativeZero = a.MayBeNegativeZero || b.MayBeNegativeZero;
-    Result.IsIntegral = (a.IsIntegral || a.isEmpty()) && (b.IsIntegral || b.isEmpty());
-    if (!a.isPlain() || !b.isPlain()) {
-        setStepOfHull(Result, a, b);
-        setLeastOfHull(Result, a, b);
-    }
-    return Result;
+void setGapsOfHull(ValueRange& Result, const ValueRange& a, const ValueRange& b) {
+    setStepOfHull(Result, a, b);
+    setLeastOfHull(Result, a, b);
 }
 
 void setStep(ValueRange& Range, double Step) {
