@@ -91,11 +91,10 @@ static double computeComparison(Operator Op, double Left, double Right) {
 
 static double computeArithmetic(Operator Op, double Left, double Right) {
     switch (Op) {
-    case Operator::Multiply: // a zero factor wins over infinities and NaNs, and gives the positive
-                             // zero
-        return Left == 0.0 || Right == 0.0 ? 0.0 : Left * Right;
-    case Operator::Divide: // a zero dividend wins over every divisor, zero included
-        return Left == 0.0 ? 0.0 : Left / Right;
+    case Operator::Multiply:
+        return multiply(Left, Right);
+    case Operator::Divide:
+        return divide(Left, Right);
     case Operator::Modulo:
         return remainder32(Left, Right);
     case Operator::Add:

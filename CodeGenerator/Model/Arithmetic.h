@@ -18,6 +18,17 @@ std::int64_t truncateTo64(double Number);
 /// double precision.
 double roundToSingle(double Number);
 
+// The two operators of double arithmetic that depart from the processor's.
+
+/// A zero factor wins over infinities and NaNs, and gives the positive zero.
+inline double multiply(double Left, double Right) {
+    return Left == 0.0 || Right == 0.0 ? 0.0 : Left * Right;
+}
+/// A zero dividend wins over every divisor, zero included.
+inline double divide(double Left, double Right) {
+    return Left == 0.0 ? 0.0 : Left / Right;
+}
+
 } // namespace hpn
 
 #endif

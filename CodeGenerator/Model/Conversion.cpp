@@ -141,15 +141,18 @@ std::int64_t stepInRaws(const ValueRange& From, const Type& To) {
 }
 
 /// Wraps an interval of raw numbers: the storage is a window that slides over it.
-ValueRange wrapInterval(std::int64_t Low, std::int64_t High, std::int64_t Step, const Type& To) {
-    const std::int64_t First = smallestRaw(To.Base);
-    if (Low >= First && High <= greatestRaw(To.Base))
-        return intervalOfRaws(Low, High, To);
-    const std::int64_t Period = std::int64_t{1} << bitsOf(To.Base);
+Residues wrapInterval(std::int64_t Low, std::int64_t High, std::int64_t Step, BaseType Base) {
+    const std::int64_t First = smallestRaw(Base);
+    const std::int64_t Last = greatestRaw(Base);
+    if (Low >= First && High <= Last)
+        return {Low, High};
+    const std::int64_t Period = std::int64_t{1} << bitsOf(Base);
     // The width can exceed the signed range.
     const std::uint64_t Width = static_cast<std::uint64_t>(High) - static_cast<std::uint64_t>(Low);
+    if (Step == 1 && Width >= static_cast<std::uint64_t>(Period))
+        return {First, Last};
     const Residues Wrapped = residuesOf(Low % Period - First, Width, Step, Period);
-    return intervalOfRaws(Wrapped.Low + First, Wrapped.High + First, To);
+    return {Wrapped.Low + First, Wrapped.High + First};
 }
 
 /// Numbers of a range to an integer storage: those in reach of the intermediate integer wrap, those
@@ -160,16 +163,16 @@ ValueRange convertToInteger(const ValueRange& From, const Type& To) {
     const double Smallest = goesThrough32(To) ? -2147483648.0 : -9223372036854775808.0;
     const double Greatest = goesThrough32(To) ? 2147483647.0 : 9223372036854774784.0;
     const bool IsLost = WholeLow < Smallest || WholeHigh > Greatest;
-    ValueRange Result = emptyRange();
-    if (WholeLow <= Greatest && WholeHigh >= Smallest)
-        Result = wrapInterval(static_cast<std::int64_t>(std::max(WholeLow, Smallest)),
-                              static_cast<std::int64_t>(std::min(WholeHigh, Greatest)),
-                              IsLost ? 1 : stepInRaws(From, To), To);
-    if (IsLost) {
-        const std::int64_t Lost = rawOfWhole(-Infinity, To);
-        Result = hull(Result, intervalOfRaws(Lost, Lost, To));
-    }
-    return Result;
+    const std::int64_t Lost = rawOfWhole(-Infinity, To);
+    if (!(WholeLow <= Greatest && WholeHigh >= Smallest))
+        return intervalOfRaws(Lost, Lost, To);
+    const Residues Wrapped = wrapInterval(static_cast<std::int64_t>(std::max(WholeLow, Smallest)),
+                                          static_cast<std::int64_t>(std::min(WholeHigh, Greatest)),
+                                          IsLost ? 1 : stepInRaws(From, To), To.Base);
+    if (IsLost && !isScaled(To))
+        return intervalOfRaws(std::min(Wrapped.Low, Lost), std::max(Wrapped.High, Lost), To);
+    const ValueRange Result = intervalOfRaws(Wrapped.Low, Wrapped.High, To);
+    return IsLost ? hull(Result, intervalOfRaws(Lost, Lost, To)) : Result;
 }
 
 ValueRange convertToBool(const ValueRange& From) {
@@ -230,8 +233,27 @@ double convertNumber(double Number, const Type& To) {
     return convertInStorage(Number, To);
 }
 
+/// The common case: numbers that an integer type without scaling holds all, fractions aside, so
+/// that nothing clips and nothing wraps.
+static bool convertHeldRange(const ValueRange& From, const Type& To, ValueRange& Result) {
+    if (isFloating(To.Base) || To.Base == BaseType::Bool || isScaled(To) || From.MayBeNaN ||
+        From.isEmpty() || (To.SaturatesHigh && From.High > To.Upper) ||
+        (To.SaturatesLow && From.Low < To.Lower))
+        return false;
+    const auto Smallest = static_cast<double>(smallestRaw(To.Base));
+    const auto Greatest = static_cast<double>(greatestRaw(To.Base));
+    if (From.Low < Smallest || From.High > Greatest)
+        return false;
+    Result = interval(static_cast<double>(static_cast<std::int64_t>(From.Low)),
+                      static_cast<double>(static_cast<std::int64_t>(From.High)), true);
+    return true;
+}
+
 ValueRange convertRange(const ValueRange& From, const Type& To) {
-    ValueRange Result = emptyRange();
+    ValueRange Result;
+    if (convertHeldRange(From, To, Result))
+        return Result;
+    Result = emptyRange();
     ValueRange Rest = From;
     if (To.SaturatesHigh && !Rest.isEmpty() && Rest.High > To.Upper) {
         Result = hull(Result, rangeOfNumber(To.Upper + 0.0));

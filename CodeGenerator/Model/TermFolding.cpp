@@ -14,8 +14,8 @@
 // 4. identities that give back one operand, bit for bit, give it back; conversions that change
 // nothing go. An operand that reads an input is never dropped in 2 and 4. Everything is judged by
 // the declared types alone, so the result holds whatever the passes do with the variables
-// afterwards. Complexity: one range walk for each node, in all quadratic in the height of the term,
-// which the reader limits.
+// afterwards. Complexity: linear, and one range walk more over each operand that takes its parent's
+// place; in all quadratic in the height of the term at worst, which the reader limits.
 
 namespace hpn {
 
@@ -131,10 +131,9 @@ bool keepsLeftAsNumber(Operator Op, const ValueRange& Left, const Term* pRight) 
     }
 }
 
-bool keepsLeft(Operator Op, const Term* pLeft, const Term* pRight) {
+bool keepsLeft(Operator Op, const ValueRange& Left, const Term* pRight) {
     if (pRight->Op != Operator::Number)
         return false;
-    const ValueRange Left = typeRange(pLeft);
     return keepsLeftAsNumber(Op, Left, pRight) || (keepsLeftAsBits(Op, pRight) && isInt32(Left));
 }
 
@@ -144,9 +143,7 @@ bool isCommutative(Operator Op) {
 }
 
 /// Which operand min and max always give, where the ranges do not meet.
-void foldExtremum(Term* pTerm) {
-    const ValueRange Left = typeRange(pTerm->pLeft);
-    const ValueRange Right = typeRange(pTerm->pRight);
+void foldExtremum(Term* pTerm, const ValueRange& Left, const ValueRange& Right) {
     if (Left.MayBeNaN || Right.MayBeNaN || Left.isEmpty() || Right.isEmpty())
         return;
     const bool IsMinimum = pTerm->Op == Operator::Minimum;
@@ -189,19 +186,19 @@ void foldLogical(Term* pTerm) {
         becomeTruthOf(pTerm, pLeft, pRight);
 }
 
-void foldBinary(Term* pTerm) {
+void foldBinary(Term* pTerm, const ValueRange& Left, const ValueRange& Right) {
     const Operator Op = pTerm->Op;
     if (Op == Operator::LogicalAnd || Op == Operator::LogicalOr)
         return foldLogical(pTerm);
     if (Op == Operator::Minimum || Op == Operator::Maximum)
-        return foldExtremum(pTerm);
-    if (keepsLeft(Op, pTerm->pLeft, pTerm->pRight))
+        return foldExtremum(pTerm, Left, Right);
+    if (keepsLeft(Op, Left, pTerm->pRight))
         becomeOperand(pTerm, pTerm->pLeft);
-    else if (isCommutative(Op) && keepsLeft(Op, pTerm->pRight, pTerm->pLeft))
+    else if (isCommutative(Op) && keepsLeft(Op, Right, pTerm->pLeft))
         becomeOperand(pTerm, pTerm->pRight);
 }
 
-void foldUnary(Term* pTerm) {
+void foldUnary(Term* pTerm, const ValueRange& Operand) {
     const Term* pOperand = pTerm->pLeft;
     const bool IsTwice = pOperand->Op == pTerm->Op;
     switch (pTerm->Op) {
@@ -218,7 +215,7 @@ void foldUnary(Term* pTerm) {
             becomeOperand(pTerm, pOperand->pLeft);
         return;
     case Operator::Absolute: // a zero of either sign and a NaN pass as they are
-        if (!(typeRange(pOperand).Low < 0.0))
+        if (!(Operand.Low < 0.0))
             becomeOperand(pTerm, pOperand);
         return;
     default:
@@ -226,23 +223,36 @@ void foldUnary(Term* pTerm) {
     }
 }
 
-void foldNode(Term* pTerm, bool IsRoot) {
-    if (pTerm->Op == Operator::Number || pTerm->hasVariable())
-        return;
-    const ValueRange Range = typeRange(pTerm);
+bool changesNothing(const Term* pCast, const ValueRange& Operand) {
+    const Type& To = *pCast->pType;
+    if (!Operand.isEmpty() && To.SaturatesHigh && Operand.High > To.Upper)
+        return false;
+    if (!Operand.isEmpty() && To.SaturatesLow && Operand.Low < To.Lower)
+        return false;
+    return isKeptByStorage(pCast->pLeft, Operand, To);
+}
+
+/// Folds a term with folded operands, whose ranges and its own are given.
+void foldNode(Term* pTerm, bool IsRoot, const ValueRange& Left, const ValueRange& Right,
+              const ValueRange& Range) {
     if (Range.isSingle() && !readsInput(pTerm))
         return becomeNumber(pTerm, Range.Low);
     if (pTerm->Op == Operator::Cast) {
-        if (!IsRoot && castChangesNothing(pTerm))
+        if (!IsRoot && changesNothing(pTerm, Left))
             becomeOperand(pTerm, pTerm->pLeft);
         return;
     }
     if (pTerm->pRight == nullptr)
-        return foldUnary(pTerm);
-    foldBinary(pTerm);
+        return foldUnary(pTerm, Left);
+    foldBinary(pTerm, Left, Right);
 }
 
-void foldOperands(Term* pTerm);
+ValueRange rangeOfNode(const Term* pTerm, const ValueRange& Left, const ValueRange& Right) {
+    if (pTerm->Op == Operator::Cast)
+        return convertRange(Left, *pTerm->pType);
+    return pTerm->pRight == nullptr ? rangeOfUnary(pTerm->Op, Left)
+                                    : rangeOfBinary(pTerm->Op, Left, Right);
+}
 
 /// A term of numbers alone has an exact result, NaN and negative zero included.
 bool foldNumbers(Term* pTerm) {
@@ -259,30 +269,30 @@ bool foldNumbers(Term* pTerm) {
     return true;
 }
 
-void foldSubterm(Term* pTerm, bool IsRoot) {
-    if (pTerm == nullptr)
-        return;
-    foldOperands(pTerm);
-    if (!foldNumbers(pTerm))
-        foldNode(pTerm, IsRoot);
-}
-
-void foldOperands(Term* pTerm) {
+/// Answers the range of what the term has become.
+ValueRange foldSubterm(Term* pTerm, bool IsRoot) {
+    ValueRange Left;
+    ValueRange Right;
+    if (pTerm->pLeft != nullptr)
+        Left = foldSubterm(pTerm->pLeft, false);
     // The value of a store is the root of its own: its conversion to the element's type stays.
-    foldSubterm(pTerm->pLeft, false);
-    foldSubterm(pTerm->pRight, pTerm->isStore());
+    if (pTerm->pRight != nullptr)
+        Right = foldSubterm(pTerm->pRight, pTerm->isStore());
+    if (pTerm->Op == Operator::Number || pTerm->hasVariable() || foldNumbers(pTerm))
+        return typeRange(pTerm);
+    const Term Before = *pTerm;
+    const ValueRange Range = rangeOfNode(pTerm, Left, Right);
+    foldNode(pTerm, IsRoot, Left, Right, Range);
+    // Whatever takes its place has another operator or other operands.
+    const bool IsSame =
+        pTerm->Op == Before.Op && pTerm->pLeft == Before.pLeft && pTerm->pRight == Before.pRight;
+    return IsSame ? Range : typeRange(pTerm);
 }
 
 } // namespace
 
 bool castChangesNothing(const Term* pCast) {
-    const Type& To = *pCast->pType;
-    const ValueRange Range = typeRange(pCast->pLeft);
-    if (!Range.isEmpty() && To.SaturatesHigh && Range.High > To.Upper)
-        return false;
-    if (!Range.isEmpty() && To.SaturatesLow && Range.Low < To.Lower)
-        return false;
-    return isKeptByStorage(pCast->pLeft, Range, To);
+    return changesNothing(pCast, typeRange(pCast->pLeft));
 }
 
 void foldTerm(Term* pTerm) {

@@ -7,6 +7,7 @@
 #include <array>
 #include <cmath>
 #include <cstdint>
+#include <functional>
 #include <limits>
 #include <numeric>
 
@@ -36,7 +37,10 @@ constexpr double Smallest = std::numeric_limits<double>::denorm_min();
 constexpr double Greatest = std::numeric_limits<double>::max();
 
 bool isWhole(double Number) {
-    return std::trunc(Number) == Number && std::fabs(Number) < Infinity;
+    const double Magnitude = std::fabs(Number);
+    if (Magnitude < 9007199254740992.0)
+        return static_cast<double>(static_cast<std::int64_t>(Number)) == Number;
+    return Magnitude < Infinity; // no double beyond 2^53 has a fraction
 }
 
 bool isNegativeZero(double Number) {
@@ -227,21 +231,23 @@ void addCorner(ValueRange& Result, double Corner) {
     Result.High = std::max(Result.High, Corner);
 }
 
-/// Hull over all corners of all pairs of pieces; NaNs of the operands are the caller's.
-ValueRange combinePieces(Operator Op, const ValueRange& Left, const ValueRange& Right) {
+/// Hull over all corners of all pairs of pieces; NaNs of the operands are the caller's. `compute`
+/// is the operator on numbers.
+template <class Operation>
+ValueRange combinePieces(const ValueRange& Left, const ValueRange& Right, const Operation& compute,
+                         bool IsIntegral) {
     ValueRange Result = emptyRange();
     const SignPieces RightPieces(Right);
     for (const Piece& a : SignPieces(Left)) {
         for (const Piece& b : RightPieces) {
-            addCorner(Result, computeBinary(Op, a.Low, b.Low));
-            addCorner(Result, computeBinary(Op, a.Low, b.High));
-            addCorner(Result, computeBinary(Op, a.High, b.Low));
-            addCorner(Result, computeBinary(Op, a.High, b.High));
+            addCorner(Result, compute(a.Low, b.Low));
+            addCorner(Result, compute(a.Low, b.High));
+            addCorner(Result, compute(a.High, b.Low));
+            addCorner(Result, compute(a.High, b.High));
         }
     }
     if (Result.isEmpty())
         return Result;
-    const bool IsIntegral = Op != Operator::Divide && Left.IsIntegral && Right.IsIntegral;
     ValueRange Shaped = makeInterval(Result.Low, Result.High, IsIntegral);
     Shaped.MayBeNaN = Result.MayBeNaN;
     Shaped.MayBeNegativeZero = Result.MayBeNegativeZero;
@@ -252,46 +258,70 @@ bool isFinite(const ValueRange& Range) {
     return -Infinity < Range.Low && Range.Low <= Range.High && Range.High < Infinity;
 }
 
+/// Its ends are those of its ordinary numbers, but for infinities next to them.
+bool hasOrdinaryEnds(const ValueRange& Range) {
+    const bool HoldsZeros = !Range.MayBeNegativeZero || (Range.Low <= 0.0 && Range.High >= 0.0);
+    const bool IsInfinity = Range.Low == Infinity || Range.High == -Infinity;
+    return !Range.isEmpty() && !IsInfinity && HoldsZeros && Range.Least == 0.0;
+}
+
 /// The hull by the outer corners alone, which is that of all pieces, where no sum can be a negative
-/// zero: only -0 + -0 and -0 - 0 are.
+/// zero: only -0 + -0 and -0 - 0 are. Infinities of different sign sum up to a NaN.
 bool combineEnds(Operator Op, const ValueRange& Left, const ValueRange& Right, ValueRange& Result) {
-    if (!isFinite(Left) || !isFinite(Right))
+    const bool AreFinite = isFinite(Left) && isFinite(Right);
+    if (!AreFinite && !(hasOrdinaryEnds(Left) && hasOrdinaryEnds(Right)))
         return false;
     const bool IsIntegral = Left.IsIntegral && Right.IsIntegral;
     if (Op == Operator::Add) {
         if (Left.MayBeNegativeZero && Right.MayBeNegativeZero)
             return false;
         Result = makeInterval(Left.Low + Right.Low, Left.High + Right.High, IsIntegral);
+        Result.MayBeNaN = (Left.Low == -Infinity && Right.High == Infinity) ||
+                          (Left.High == Infinity && Right.Low == -Infinity);
         return true;
     }
     if (Left.MayBeNegativeZero)
         return false;
     Result = makeInterval(Left.Low - Right.High, Left.High - Right.Low, IsIntegral);
+    Result.MayBeNaN = (Left.Low == -Infinity && Right.Low == -Infinity) ||
+                      (Left.High == Infinity && Right.High == Infinity);
     return true;
 }
 
 ValueRange rangeOfSum(Operator Op, const ValueRange& Left, const ValueRange& Right) {
     ValueRange Result;
-    if (!combineEnds(Op, Left, Right, Result))
-        Result = combinePieces(Op, Left, Right);
+    if (!combineEnds(Op, Left, Right, Result)) {
+        const bool IsIntegral = Left.IsIntegral && Right.IsIntegral;
+        Result = Op == Operator::Add ? combinePieces(Left, Right, std::plus<>(), IsIntegral)
+                                     : combinePieces(Left, Right, std::minus<>(), IsIntegral);
+    }
     setStepOfSum(Result, Left, Right);
     Result.MayBeNaN = Result.MayBeNaN || Left.MayBeNaN || Right.MayBeNaN;
     return Result;
 }
 
+/// No number in it has a sign, and the ends are numbers in it.
+bool isPositive(const ValueRange& Range) {
+    return 0.0 <= Range.Low && Range.Low <= Range.High && !Range.MayBeNegativeZero &&
+           Range.Least == 0.0;
+}
+
 /// A zero factor gives 0.0 even against a NaN; only what is not zero lets the NaN through.
 ValueRange rangeOfProduct(const ValueRange& Left, const ValueRange& Right) {
-    // Whole factors give no negative zero, neither by their signs nor by underflow.
-    if (Left.IsIntegral && Right.IsIntegral && !Left.MayBeNaN && !Right.MayBeNaN &&
-        isFinite(Left) && isFinite(Right)) {
-        const auto [Low, High] =
-            std::minmax({computeBinary(Operator::Multiply, Left.Low, Right.Low),
-                         computeBinary(Operator::Multiply, Left.Low, Right.High),
-                         computeBinary(Operator::Multiply, Left.High, Right.Low),
-                         computeBinary(Operator::Multiply, Left.High, Right.High)});
-        return makeInterval(Low, High, true);
+    const bool AreWhole = Left.IsIntegral && Right.IsIntegral;
+    if (!Left.MayBeNaN && !Right.MayBeNaN) {
+        // Whole factors give no negative zero, neither by their signs nor by underflow.
+        if (AreWhole && isFinite(Left) && isFinite(Right)) {
+            const auto [Low, High] =
+                std::minmax({multiply(Left.Low, Right.Low), multiply(Left.Low, Right.High),
+                             multiply(Left.High, Right.Low), multiply(Left.High, Right.High)});
+            return makeInterval(Low, High, true);
+        }
+        if (isPositive(Left) && isPositive(Right))
+            return makeInterval(multiply(Left.Low, Right.Low), multiply(Left.High, Right.High),
+                                AreWhole);
     }
-    ValueRange Result = combinePieces(Operator::Multiply, Left, Right);
+    ValueRange Result = combinePieces(Left, Right, multiply, AreWhole);
     if ((Left.MayBeNaN && holdsZero(Right)) || (Right.MayBeNaN && holdsZero(Left)))
         Result = hull(Result, makeInterval(0.0, 0.0, true));
     const bool LeftNaNPasses = Left.MayBeNaN && holdsOtherThan(Right, 0.0);
@@ -302,7 +332,7 @@ ValueRange rangeOfProduct(const ValueRange& Left, const ValueRange& Right) {
 
 /// A zero dividend gives 0.0 even against a NaN.
 ValueRange rangeOfQuotient(const ValueRange& Left, const ValueRange& Right) {
-    ValueRange Result = combinePieces(Operator::Divide, Left, Right);
+    ValueRange Result = combinePieces(Left, Right, divide, false);
     if (Right.MayBeNaN && holdsZero(Left))
         Result = hull(Result, makeInterval(0.0, 0.0, true));
     const bool RightNaNPasses = Right.MayBeNaN && holdsOtherThan(Left, 0.0);
@@ -714,16 +744,9 @@ ValueRange rangeOfAnything() {
     return Result;
 }
 
-ValueRange hull(const ValueRange& a, const ValueRange& b) {
-    ValueRange Result;
-    Result.Low = std::min(a.Low, b.Low);
-    Result.High = std::max(a.High, b.High);
-    Result.MayBeNaN = a.MayBeNaN || b.MayBeNaN;
-    Result.MayBeNegativeZero = a.MayBeNegativeZero || b.MayBeNegativeZero;
-    Result.IsIntegral = (a.IsIntegral || a.isEmpty()) && (b.IsIntegral || b.isEmpty());
+void setGapsOfHull(ValueRange& Result, const ValueRange& a, const ValueRange& b) {
     setStepOfHull(Result, a, b);
     setLeastOfHull(Result, a, b);
-    return Result;
 }
 
 void setStep(ValueRange& Range, double Step) {

@@ -3,6 +3,7 @@
 
 #include "Language/Program.h"
 
+#include <algorithm>
 #include <cstdint>
 
 namespace hpn {
@@ -26,6 +27,8 @@ struct ValueRange {
     double Least = 0.0;
 
     bool isEmpty() const { return Low > High; }
+    /// Nothing is known of the numbers between the ends but that they may be whole.
+    bool isPlain() const { return Step == 0.0 && Least == 0.0; }
     /// One number and nothing else: not a NaN, and of one sign if it is zero.
     bool isSingle() const { return Low == High && !MayBeNaN && !MayBeNegativeZero; }
     bool contains(double Number) const;
@@ -51,8 +54,20 @@ struct Residues {
 };
 Residues residuesOf(std::int64_t First, std::uint64_t Width, std::int64_t Step,
                     std::int64_t Period);
+/// What a hull of two ranges knows between its ends.
+void setGapsOfHull(ValueRange& Result, const ValueRange& a, const ValueRange& b);
 /// Smallest range that holds both.
-ValueRange hull(const ValueRange& a, const ValueRange& b);
+inline ValueRange hull(const ValueRange& a, const ValueRange& b) {
+    ValueRange Result;
+    Result.Low = std::min(a.Low, b.Low);
+    Result.High = std::max(a.High, b.High);
+    Result.MayBeNaN = a.MayBeNaN || b.MayBeNaN;
+    Result.MayBeNegativeZero = a.MayBeNegativeZero || b.MayBeNegativeZero;
+    Result.IsIntegral = (a.IsIntegral || a.isEmpty()) && (b.IsIntegral || b.isEmpty());
+    if (!a.isPlain() || !b.isPlain())
+        setGapsOfHull(Result, a, b);
+    return Result;
+}
 
 /// What the operator gives for operands out of the given ranges. Never too narrow under the
 /// arithmetic of `Term`s; as narrow as an interval can be for nearly all operands. `Op` is one of
