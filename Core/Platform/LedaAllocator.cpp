@@ -2,12 +2,15 @@
 
 #include "LEDA/error.h"
 
+#include <cstdint>
+
 namespace leda {
 
 namespace {
 
 constexpr std::size_t first_chunk_bytes = 64 * 1024;
 constexpr std::size_t largest_chunk_bytes = 1024 * 1024;
+constexpr std::size_t line_bytes = 64; // of a cache line
 constexpr std::size_t run_bytes =
     4 * 1024; // a free list is filled with about so many bytes at a time
 
@@ -21,12 +24,16 @@ constexpr std::size_t run_bytes =
 memory_manager std_memory_mgr;
 
 // Takes a run of neighbouring blocks from the newest chunk into the empty free list of the class,
-// in ascending order, and answers the first. The rest of a chunk that is too short for one block is
-// given up until release_chunks.
+// in ascending order, and answers the first. Blocks of the size of a cache line, as nodes are, take
+// one each. The rest of a chunk that is too short for one block is given up until release_chunks.
 void* memory_manager::refill(std::size_t size_class) {
     const std::size_t bytes = (size_class ? size_class : 1) * granule;
-    if (std::size_t(m_end - m_cursor) < bytes)
+    const auto to_line = [bytes](const char* at) {
+        return bytes == line_bytes ? -reinterpret_cast<std::uintptr_t>(at) % line_bytes : 0;
+    };
+    if (std::size_t(m_end - m_cursor) < bytes + to_line(m_cursor))
         add_chunk();
+    m_cursor += to_line(m_cursor);
     std::size_t count = bytes < run_bytes ? run_bytes / bytes : 1;
     const std::size_t room = std::size_t(m_end - m_cursor) / bytes;
     if (count > room)

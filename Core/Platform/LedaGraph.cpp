@@ -162,13 +162,14 @@ bool graph::check_consistency() const {
 
 bool graph::check_adjacency(node v) const {
     int count = 0;
-    edge before = nullptr;
+    const edge last_out = v->first_out_edge_rev();
+    edge before = last_out;
     for (edge e = v->m_first_out; e; e = e->m_next_out, ++count) {
         if (e->m_end[0] != v || e->m_prev_out != before || count > m_edges)
             return false;
         before = e;
     }
-    if (before != v->m_last_out || count != v->m_outdeg)
+    if (before != last_out || count != v->m_outdeg)
         return false;
     count = 0;
     before = nullptr;
@@ -180,12 +181,17 @@ bool graph::check_adjacency(node v) const {
     return before == v->m_last_in && count == v->m_indeg;
 }
 
+// The last out-edge is found by way of the first.
 void graph::link_out(edge e, node v) {
     e->m_end[0] = v;
     e->m_next_out = nullptr;
-    e->m_prev_out = v->m_last_out;
-    (v->m_last_out ? v->m_last_out->m_next_out : v->m_first_out) = e;
-    v->m_last_out = e;
+    if (edge first = v->m_first_out) {
+        e->m_prev_out = first->m_prev_out;
+        first->m_prev_out->m_next_out = e;
+        first->m_prev_out = e;
+    } else {
+        v->m_first_out = e->m_prev_out = e;
+    }
     ++v->m_outdeg;
 }
 
@@ -200,8 +206,9 @@ void graph::link_in(edge e, node w) {
 
 void graph::unlink_out(edge e) {
     node v = e->m_end[0];
-    (e->m_prev_out ? e->m_prev_out->m_next_out : v->m_first_out) = e->m_next_out;
-    (e->m_next_out ? e->m_next_out->m_prev_out : v->m_last_out) = e->m_prev_out;
+    (e != v->m_first_out ? e->m_prev_out->m_next_out : v->m_first_out) = e->m_next_out;
+    if (edge behind = e->m_next_out ? e->m_next_out : v->m_first_out)
+        behind->m_prev_out = e->m_prev_out; // the first one notes a new last one
     --v->m_outdeg;
 }
 

@@ -24,7 +24,7 @@ public:
     // First and last out-edge, first in-edge; null if there is none.
     edge first_out_edge() const { return m_first_out; }
     edge stop_out_edge() const { return nullptr; }
-    edge first_out_edge_rev() const { return m_last_out; }
+    edge first_out_edge_rev() const;
     edge stop_out_edge_rev() const { return nullptr; }
     edge first_in_edge() const { return m_first_in; }
     edge stop_in_edge() const { return nullptr; }
@@ -38,16 +38,16 @@ private:
     friend struct order_number<node>;
     node_struct() = default;
 
-    // What a search reads stands together, so that it mostly lies in one cache line.
+    // 64 bytes: with the alignment of the pools a node takes one cache line. So the last out-edge
+    // has no place here: it stands in the first one.
     edge m_first_out = nullptr;
     int m_index = 0;
     unsigned int m_graph = 0; // serial number of the graph
     edge m_first_in = nullptr;
     alignas(8) unsigned char m_record[8]{}; // GRAPH's node information
-    node m_next =
-        nullptr; // in the node list; of a deleted node, in the graph's list of deleted ones
+    // In the node list; of a deleted node, in the graph's list of deleted ones.
+    node m_next = nullptr;
     node m_prev = nullptr;
-    edge m_last_out = nullptr;
     edge m_last_in = nullptr;
     int m_outdeg = 0;
     int m_indeg = 0;
@@ -60,7 +60,7 @@ public:
     // The neighbours among the source's out-edges, and the next of the target's in-edges; null at
     // the ends.
     edge next_out_edge() const { return m_next_out; }
-    edge pred_out_edge() const { return m_prev_out; }
+    edge pred_out_edge() const { return m_prev_out->m_next_out ? m_prev_out : nullptr; }
     edge next_in_edge() const { return m_next_in; }
     // terminal(0) is the source, terminal(1) the target.
     node terminal(int i) const { return m_end[i]; }
@@ -71,10 +71,11 @@ private:
     friend class graph;
     template <class N, class E>
     friend class GRAPH;
+    friend struct node_struct;
     friend struct order_number<edge>;
     edge_struct() = default;
 
-    // As in a node, what a search reads comes first.
+    // What a search reads comes first, so that it mostly lies in one cache line.
     edge m_next_out = nullptr;
     node m_end[2] = {};
     edge m_next_in = nullptr;
@@ -83,9 +84,13 @@ private:
     alignas(8) unsigned char m_record[8]{}; // GRAPH's edge information
     edge m_next = nullptr;                  // in the edge list
     edge m_prev = nullptr;
-    edge m_prev_out = nullptr;
+    edge m_prev_out = nullptr; // of the first out-edge: the last one
     edge m_prev_in = nullptr;
 };
+
+inline edge node_struct::first_out_edge_rev() const {
+    return m_first_out ? m_first_out->m_prev_out : nullptr;
+}
 
 namespace order_detail {
 

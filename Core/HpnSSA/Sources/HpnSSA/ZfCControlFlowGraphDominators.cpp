@@ -56,7 +56,7 @@ private:
     };
 
     void dfsDom(leda::node v);
-    int enter(leda::node w);
+    bool enter(leda::node w);
     int eval(int v);
     void compress(int v);
     void link(int v, int w);
@@ -114,33 +114,36 @@ void DominatorSearch::emptyBucket(int p) {
     m_Nodes[p].Bucket = 0;
 }
 
-int DominatorSearch::enter(leda::node w) {
-    ++n;
-    m_Number[w] = n;
+// Gives the node the next number; false, and nothing done, if it has one.
+bool DominatorSearch::enter(leda::node w) {
+    int& Number = m_Number[w];
+    if (Number != 0) {
+        return false;
+    }
+    Number = ++n;
     Ndfs[n] = w;
     m_Nodes[n].Sdno = n;
     m_Nodes[n].Label = n;
     m_Nodes[n].Size = 1;
-    return n;
+    return true;
 }
 
 // The open path of the search stands in Path, as the tree edges by which its nodes were entered.
 void DominatorSearch::dfsDom(leda::node v) {
     leda::stack<leda::edge> Path;
-    int Number = enter(v);
+    enter(v);
+    int Number = n;
     leda::edge e = m_Graph.first_adj_edge(v);
     for (;;) {
-        while (e != nullptr && m_Number.defined(m_Graph.target(e))) {
+        while (e != nullptr && !enter(m_Graph.target(e))) {
             e = m_Graph.adj_succ(e);
         }
         if (e != nullptr) {
-            // Down to a new node.
-            leda::node w = m_Graph.target(e);
-            const int Parent = Number;
-            Number = enter(w);
-            m_Nodes[Number].Parent = Parent;
+            // Down to the new node.
+            m_Nodes[n].Parent = Number;
+            Number = n;
             Path.push(e);
-            e = m_Graph.first_adj_edge(w);
+            e = m_Graph.first_adj_edge(m_Graph.target(e));
         } else if (!Path.empty()) {
             // Back, and on with the next out-edge of the parent.
             Number = m_Nodes[Number].Parent;
