@@ -207,7 +207,8 @@ TEST(MemoryController, PooledBlocksKeepTheirBytes) {
         const unsigned int Size = Random() % 100 == 0 ? Random() % 200000 : Random() % 1200;
         auto* const pBytes = static_cast<unsigned char*>(Controller.allocMemBlock(Size));
         // No object of a size that is no multiple of 16 can need more than 8.
-        ASSERT_EQ(reinterpret_cast<std::uintptr_t>(pBytes) % ((Size + 7) / 8 % 2 == 0 ? 16 : 8),
+        ASSERT_EQ(reinterpret_cast<std::uintptr_t>(pBytes) %
+                      ((std::max(Size, 1u) + 7) / 8 % 2 == 0 ? 16 : 8),
                   0u);
         Live.push_back({pBytes, Size, static_cast<unsigned char>(i)});
         std::fill_n(pBytes, Size, Live.back().Mark);
