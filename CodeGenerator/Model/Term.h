@@ -58,7 +58,7 @@ public:
         m_Offset = Position.Offset;
     }
 };
-static_assert(sizeof(void*) > 8 || sizeof(Term) <= 32, "two terms fill a cache line");
+static_assert(sizeof(Term) <= 32, "two terms fill a cache line");
 
 /// Gives out terms; they go when the arena goes. One at a time in a process, like the graph that it
 /// serves.
