@@ -58,7 +58,7 @@ public:
         m_Offset = Position.Offset;
     }
 };
-static_assert(sizeof(void*) > 8 || sizeof(Term) <= 32, "two terms fill a cache line");
+static_assert(sizeof(Term) <= 32, "two terms fill a cache line");
 
 /// Gives out terms; they go when the arena goes. One at a time in a process, like the graph that it
 /// serves.
@@ -119,8 +119,8 @@ bool readsInput(const Term* pTerm);
 bool castChangesNothing(const Term* pCast);
 /// Folds in place what is constant by its numbers and by the types of what it reads: never changes
 /// the number, bit for bit, and never drops the read of an input that C would make. The root
-/// conversion of a right-hand side stays unless all of it folds.
-void foldTerm(Term* pTerm);
+/// conversion of a right-hand side stays unless all of it folds. Whether anything was folded.
+bool foldTerm(Term* pTerm);
 /// Same shape, same numbers (bit for bit), same original variables.
 bool isSameTerm(const Term* a, const Term* b);
 

@@ -269,24 +269,31 @@ bool foldNumbers(Term* pTerm) {
     return true;
 }
 
-/// Answers the range of what the term has become.
-ValueRange foldSubterm(Term* pTerm, bool IsRoot) {
+/// Answers the range of what the term has become, and notes if it has become anything else.
+ValueRange foldSubterm(Term* pTerm, bool IsRoot, bool& HasChanged) {
     ValueRange Left;
     ValueRange Right;
     if (pTerm->pLeft != nullptr)
-        Left = foldSubterm(pTerm->pLeft, false);
+        Left = foldSubterm(pTerm->pLeft, false, HasChanged);
     // The value of a store is the root of its own: its conversion to the element's type stays.
     if (pTerm->pRight != nullptr)
-        Right = foldSubterm(pTerm->pRight, pTerm->isStore());
-    if (pTerm->Op == Operator::Number || pTerm->hasVariable() || foldNumbers(pTerm))
+        Right = foldSubterm(pTerm->pRight, pTerm->isStore(), HasChanged);
+    if (pTerm->Op == Operator::Number || pTerm->hasVariable())
         return typeRange(pTerm);
+    if (foldNumbers(pTerm)) {
+        HasChanged = true;
+        return typeRange(pTerm);
+    }
     const Term Before = *pTerm;
     const ValueRange Range = rangeOfNode(pTerm, Left, Right);
     foldNode(pTerm, IsRoot, Left, Right, Range);
     // Whatever takes its place has another operator or other operands.
     const bool IsSame =
         pTerm->Op == Before.Op && pTerm->pLeft == Before.pLeft && pTerm->pRight == Before.pRight;
-    return IsSame ? Range : typeRange(pTerm);
+    if (IsSame)
+        return Range;
+    HasChanged = true;
+    return typeRange(pTerm);
 }
 
 } // namespace
@@ -295,8 +302,10 @@ bool castChangesNothing(const Term* pCast) {
     return changesNothing(pCast, typeRange(pCast->pLeft));
 }
 
-void foldTerm(Term* pTerm) {
-    foldSubterm(pTerm, true);
+bool foldTerm(Term* pTerm) {
+    bool HasChanged = false;
+    foldSubterm(pTerm, true, HasChanged);
+    return HasChanged;
 }
 
 } // namespace hpn

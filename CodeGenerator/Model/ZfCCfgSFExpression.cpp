@@ -326,8 +326,7 @@ void ZfCCfgSFExpression::foldConstants() {
             !hpn::mayRewrite("expression folded", m_pRoot->getPosition()))
             return;
     }
-    hpn::foldTerm(m_pRoot);
-    if (m_NumberOfReads > 0)
+    if (hpn::foldTerm(m_pRoot))
         noteReads();
 }
 

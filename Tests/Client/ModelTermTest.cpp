@@ -10,6 +10,7 @@
 #include <gtest/gtest.h>
 
 #include <memory>
+#include <set>
 
 namespace {
 
@@ -231,6 +232,55 @@ TEST_F(ModelTerm, ValuesAndEndsComeFromTheVersionsAsFarAsTheyAreKnown) {
     Replaced.foldConstants();
     EXPECT_EQ(Replaced.getRoot()->Op, Operator::Number);
     EXPECT_EQ(Replaced.getRoot()->Number, 13.0);
+}
+
+// Many random terms read more variables than an expression keeps, and many the same one twice.
+TEST_F(ModelTerm, AnExpressionKnowsWhatItReadsWhateverIsDoneToIt) {
+    using Variables = std::set<ZfCCfgVariable*>;
+    const auto check = [](ZfCCfgSFExpression& Of) {
+        Variables Expected;
+        std::vector<const Term*> Stack{Of.getRoot()};
+        while (!Stack.empty()) {
+            const Term* pTerm = Stack.back();
+            Stack.pop_back();
+            if (pTerm == nullptr)
+                continue;
+            if (pTerm->hasVariable())
+                Expected.insert(pTerm->pVariable);
+            Stack.insert(Stack.end(), {pTerm->pLeft, pTerm->pRight});
+        }
+        Variables Found;
+        for (ZfCCfgVariable* pVariable : Of.getUsedVariables())
+            Found.insert(pVariable);
+        EXPECT_EQ(Found, Expected);
+        EXPECT_EQ(Of.hasSideEffects(), readsInput(Of.getRoot()));
+        return Expected;
+    };
+    std::size_t Most = 0;
+    for (int i = 0; i < 2000; ++i) {
+        ZfCCfgSFExpression& Made = expression(randomTerm(i % 5));
+        const Variables Originals = check(Made);
+        Most = std::max(Most, Originals.size());
+        for (ZfCCfgVariable* pOriginal : Originals) {
+            ZfCSSAVariable* pVersion = ZfCCfgFactory::getInstance()->createSSAVariable(pOriginal);
+            if (ZfCCfgValue Value(1.0); m_Random() % 2 == 0)
+                pVersion->setVarValueAndAdjustCfgValue(Value);
+            Made.replaceVariable(pOriginal, pVersion);
+            check(Made);
+        }
+        Made.replaceConstantVariables();
+        const Variables Left = check(Made);
+        Made.foldConstants();
+        check(Made);
+        if (Left.size() > 1) {
+            Made.replaceVariable(*Left.begin(), *Left.rbegin());
+            check(Made);
+        }
+        Made.replaceConditionWithConstant(1.0);
+        check(Made);
+        ASSERT_FALSE(HasFailure()) << "term " << i;
+    }
+    EXPECT_GT(Most, 4U);
 }
 
 TEST_F(ModelTerm, ANaNIsNoConstantAndNeverTheEndOfARange) {
