@@ -16,11 +16,14 @@ inline void prefetch(const void* pMemory) {
 template <class TItem, class TFetch, class TDo>
 class ZfCBatch {
 public:
+    // Fetch asks for an item's memory, Do does its work.
     ZfCBatch(TFetch Fetch, TDo Do) : m_Fetch(Fetch), m_Do(Do) {}
     ZfCBatch(const ZfCBatch&) = delete;
     ZfCBatch& operator=(const ZfCBatch&) = delete;
+    // Does what is left.
     ~ZfCBatch() { flush(); }
 
+    // Takes an item over, to be done with others or at the end.
     void append(TItem const& Item) {
         m_Fetch(Item);
         m_Items[m_Size++] = Item;

@@ -14,8 +14,10 @@ class ZfCPhiFunction;
 // full, so that a run allocates hardly ever.
 class ZfCWorkList {
 public:
+    // Whether there is nothing to do; and makes it so.
     bool empty() const { return m_Size == 0; }
     void clear() { m_Size = 0; }
+    // Adds a number behind all others.
     void append(int Number) {
         if (m_Size == m_Ring.size()) {
             grow();
