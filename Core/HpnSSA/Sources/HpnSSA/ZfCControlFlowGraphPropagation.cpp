@@ -70,6 +70,7 @@ void ZfCControlFlowGraph::buildVarUses() {
             });
         }
     }
+    Uses.finish();
 }
 
 void ZfCControlFlowGraph::addSSAEdges() {
@@ -101,6 +102,7 @@ void ZfCControlFlowGraph::addSSAEdges() {
             }
         });
     }
+    Pairs.finish();
 }
 
 void ZfCControlFlowGraph::initSparseConditionalConstant(leda::node StartNode,

@@ -254,6 +254,7 @@ void NodeRenamer::renamePhiOperands(ZfCBasicBlock* pBasicBlock, int Index) {
     for (ZfCPhiFunction* pPhiFunc : pBasicBlock->getPhiFunctions()) {
         Operands.append(pPhiFunc);
     }
+    Operands.finish();
 }
 
 // What all calls of the procedure return is current at its exit, here. A second in-edge of the

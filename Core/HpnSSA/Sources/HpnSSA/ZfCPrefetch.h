@@ -12,7 +12,8 @@ inline void prefetch(const void* pMemory) {
 }
 
 // Collects items of work whose memory lies far apart, and does them in the order in which they
-// came, some dozens at a time: first Fetch is called for each, then Do.
+// came, some dozens at a time: first Fetch is called for each, then Do. What is left at the end
+// waits for finish, since the work may fail.
 template <class TItem, class TFetch, class TDo>
 class ZfCBatch {
 public:
@@ -20,25 +21,23 @@ public:
     ZfCBatch(TFetch Fetch, TDo Do) : m_Fetch(Fetch), m_Do(Do) {}
     ZfCBatch(const ZfCBatch&) = delete;
     ZfCBatch& operator=(const ZfCBatch&) = delete;
-    // Does what is left.
-    ~ZfCBatch() { flush(); }
 
     // Takes an item over, to be done with others or at the end.
     void append(TItem const& Item) {
         m_Fetch(Item);
         m_Items[m_Size++] = Item;
         if (m_Size == s_Most)
-            flush();
+            finish();
     }
-
-private:
-    static constexpr int s_Most = 32;
-
-    void flush() {
+    // Does what is left.
+    void finish() {
         for (int i = 0; i < m_Size; ++i)
             m_Do(m_Items[i]);
         m_Size = 0;
     }
+
+private:
+    static constexpr int s_Most = 32;
 
     TFetch m_Fetch;
     TDo m_Do;
