@@ -269,15 +269,11 @@ bool foldNumbers(Term* pTerm) {
     return true;
 }
 
-/// Answers the range of what the term has become, and notes if it has become anything else.
-ValueRange foldSubterm(Term* pTerm, bool IsRoot, bool& HasChanged) {
-    ValueRange Left;
-    ValueRange Right;
-    if (pTerm->pLeft != nullptr)
-        Left = foldSubterm(pTerm->pLeft, false, HasChanged);
-    // The value of a store is the root of its own: its conversion to the element's type stays.
-    if (pTerm->pRight != nullptr)
-        Right = foldSubterm(pTerm->pRight, pTerm->isStore(), HasChanged);
+/// Folds a term with folded operands, whose ranges are given. Answers the range of what it has
+/// become, and notes if it has become anything else. Never a part of the walk below, which recurs
+/// as deep as the term is and should need little of the stack at each level.
+[[gnu::noinline]] ValueRange foldWithOperands(Term* pTerm, bool IsRoot, const ValueRange& Left,
+                                              const ValueRange& Right, bool& HasChanged) {
     if (pTerm->Op == Operator::Number || pTerm->hasVariable())
         return typeRange(pTerm);
     if (foldNumbers(pTerm)) {
@@ -294,6 +290,18 @@ ValueRange foldSubterm(Term* pTerm, bool IsRoot, bool& HasChanged) {
         return Range;
     HasChanged = true;
     return typeRange(pTerm);
+}
+
+/// Folds a term and all below it; as above.
+ValueRange foldSubterm(Term* pTerm, bool IsRoot, bool& HasChanged) {
+    ValueRange Left;
+    ValueRange Right;
+    if (pTerm->pLeft != nullptr)
+        Left = foldSubterm(pTerm->pLeft, false, HasChanged);
+    // The value of a store is the root of its own: its conversion to the element's type stays.
+    if (pTerm->pRight != nullptr)
+        Right = foldSubterm(pTerm->pRight, pTerm->isStore(), HasChanged);
+    return foldWithOperands(pTerm, IsRoot, Left, Right, HasChanged);
 }
 
 } // namespace
